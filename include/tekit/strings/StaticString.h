@@ -1,0 +1,61 @@
+// Text in an inline array of N + 1 bytes: never allocates, silently truncates.
+//
+//   StaticString<64> label;
+//   label = longText;   // keeps the first 64 bytes (never half a double-byte character)
+//
+// Instantiated (and exported) for N = 64, 256, 260 (the Windows path limit) and 1024.
+#pragma once
+
+#include "tekit/strings/String.h"
+
+namespace tekit {
+
+template <int N> class StaticString : public String {
+public:
+    StaticString() { m_buffer[0] = '\0'; }
+    StaticString(char const* text) { m_buffer[0] = '\0', String::Assign(text); }
+    StaticString(String const& text) { m_buffer[0] = '\0', String::Assign(text); }
+    StaticString(StaticString const& other) : String() {
+        m_buffer[0] = '\0';
+        String::Assign(other);
+    }
+    StaticString& operator=(StaticString const& other) {
+        String::Assign(other);
+        return *this;
+    }
+    virtual StaticString& operator=(String const& other) {
+        String::Assign(other);
+        return *this;
+    }
+    StaticString& operator=(char const* text) {
+        String::Assign(text);
+        return *this;
+    }
+
+    char const* GetBufferReadPtr() const override { return m_buffer; }
+    char* GetBufferWritePtr() override {
+        InvalSizeCache();
+        return m_buffer;
+    }
+    int GetBufferSize() const override { return N; }
+    /// Always N + 1, whatever is asked: the storage cannot grow.
+    int RequestBufferSize(int, bool, bool) override { return N + 1; }
+
+private:
+    char m_buffer[N + 1];
+};
+
+#if defined(_WIN32)
+#define TEKIT_EXTERN_TEMPLATE extern template class __declspec(dllimport)
+#else
+#define TEKIT_EXTERN_TEMPLATE extern template class TEKIT_API
+#endif
+#if !defined(TEKIT_BUILDING)
+TEKIT_EXTERN_TEMPLATE StaticString<64>;
+TEKIT_EXTERN_TEMPLATE StaticString<256>;
+TEKIT_EXTERN_TEMPLATE StaticString<260>;
+TEKIT_EXTERN_TEMPLATE StaticString<1024>;
+#endif
+#undef TEKIT_EXTERN_TEMPLATE
+
+} // namespace tekit

@@ -1,0 +1,14 @@
+#include "platform/Platform.h"
+
+#include <cstdio>
+
+namespace tekit::platform {
+
+void WriteDebugText(char const* text) {
+    if (!text)
+        return;
+    std::fputs(text, stderr);
+    std::fflush(stderr);
+}
+
+} // namespace tekit::platform
