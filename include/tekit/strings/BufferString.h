@@ -15,6 +15,7 @@ namespace tekit {
 class TEKIT_API BufferString : public String {
 public:
     BufferString();
+    /// The buffer keeps its contents: it may already hold the text to work on.
     BufferString(char* buffer, int size);
     /// Read-only view of constant text.
     BufferString(char const* buffer, int size);

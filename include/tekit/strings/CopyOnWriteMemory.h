@@ -22,10 +22,13 @@ public:
     /// allocates `size` bytes rounded up to 4 and copies them.
     CopyOnWriteMemory(unsigned char const* bytes, int size, bool copy);
     /// Copies the four fields as they stand (count included): for building a block, not for
-    /// sharing one. Sharing is always done with AddRef.
+    /// sharing one. Sharing is always done with AddRef. A copy of a block that owns its data
+    /// points at the same bytes, so only one of the two may keep owning them (the destructor
+    /// frees owned data).
     CopyOnWriteMemory(CopyOnWriteMemory const& other);
     CopyOnWriteMemory& operator=(CopyOnWriteMemory const& other);
 
+    /// Frees the data when the block owns it.
     virtual ~CopyOnWriteMemory();
     /// Takes a reference (heap blocks count it; static blocks do not) and returns the block.
     virtual CopyOnWriteMemory* AddRef() const;
@@ -35,14 +38,17 @@ public:
 
     unsigned char const* GetReadPtr() const { return m_data; }
     int GetBufferSize() const { return m_bufferSize; }
+    /// The current reference count (read atomically).
     std::int32_t GetRefCount() const;
     bool OwnsData() const { return m_ownsData; }
 
     /// Returns a pointer through which the holder may write; copies the block first when it is
     /// shared (count other than 1).
     unsigned char* GetWritePtr(CopyOnWriteMemory** holder);
-    /// Makes the holder's block at least `size` bytes (see the growth rules in the
-    /// implementation) and returns the new buffer size.
+    /// Makes the holder's block at least `size` bytes and returns the new buffer size. Without
+    /// `exactSize` a buffer never shrinks and grows with slack (size + 4 + size / 32); sizes
+    /// are rounded up to 4. A shared block is never resized: the holder gets a new block. A
+    /// failed allocation raises TE_OUT_OF_MEMORY and leaves the holder's block as it was.
     int ResizeBuffer(CopyOnWriteMemory** holder, int size, bool keepContents, bool exactSize);
     /// The holder's block afterwards holds a private copy of `size` bytes.
     void SetContents(CopyOnWriteMemory** holder, unsigned char const* bytes, int size);
@@ -69,6 +75,8 @@ protected:
 class TEKIT_API GlobalConstantCopyOnWriteMemory : public CopyOnWriteMemory {
 public:
     GlobalConstantCopyOnWriteMemory(unsigned char const* bytes, int size, bool copy);
+    /// Copies and moves copy the fields; a move also takes over owned data, so the source no
+    /// longer frees it.
     GlobalConstantCopyOnWriteMemory(GlobalConstantCopyOnWriteMemory const& other);
     GlobalConstantCopyOnWriteMemory(GlobalConstantCopyOnWriteMemory&& other) noexcept;
     GlobalConstantCopyOnWriteMemory& operator=(GlobalConstantCopyOnWriteMemory const& other);

@@ -44,24 +44,41 @@ public:
     using String::Assign;
     void Assign(String const& other) override;
     void Clear() override;
+    /// True while the string holds a global constant block: an interned constant's, or the
+    /// shared empty block when it is empty.
     bool IsGlobalConstant() const override;
     char const* GetBufferReadPtr() const override;
+    /// Copies the block first when it is shared or refers to constant text.
     char* GetBufferWritePtr() override;
     int GetBufferSize() const override;
     CopyOnWriteMemory* GetCopyOnWriteMemory() const override;
+    /// Asks the block for max(numBytes, 1) bytes. Afterwards the block is this string's alone;
+    /// without `keepContents` the text is empty.
     int RequestBufferSize(int numBytes, bool keepContents, bool exactSize) override;
     virtual void Assign(DynamicString const& other);
     virtual int Reserve(int numBytes, bool exactSize);
     virtual int Reserve(int numBytes);
 
-    /// Appends `separator` (when not empty) and `item`: building a list one item at a time.
+    /// Appends `separator` (only when this list is not empty yet) and `item`: building a list
+    /// one item at a time.
     void ListAppend(String const& item, char const* separator);
 
     /// The text as a view (valid until the next write).
-    std::string_view View() const { return {GetBufferReadPtr(), size_t(GetNumBytes())}; }
+    std::string_view View() const {
+        return {GetBufferReadPtr(), size_t(GetNumBytes())};
+    }
 
 protected:
+    /// The holder: the string's only link to its block (null only for a string built with
+    /// ForDynamicStringNullMemoryReference until its owner sets it).
     CopyOnWriteMemory* m_memory = nullptr;
+
+private:
+    /// Refers to the shared empty block when no block was set up.
+    void EnsureMemory();
+    /// True when the block is this string's alone but refers to constant text it must not
+    /// write (built with `copy` false): a write takes an owned copy first.
+    bool HoldsConstantAlone() const;
 };
 
 TEKIT_API DynamicString operator+(String const& a, String const& b);

@@ -25,10 +25,13 @@ public:
 
     /// The registered constant whose text equals `s`, or `s` itself when there is none.
     static String const* GetGlobalConstantIfExists(String const* s);
-    /// Empties the registry (at shutdown).
+    /// Empties the registry (at shutdown); the constants themselves stay usable.
     static void ClearAllMemory();
 
 private:
+    /// Removes this constant from the registry, if it is the one registered for its text.
+    void Unregister();
+
     GlobalConstantCopyOnWriteMemory m_constant;
 };
 

@@ -13,8 +13,14 @@ namespace tekit {
 template <int N> class StaticString : public String {
 public:
     StaticString() { m_buffer[0] = '\0'; }
-    StaticString(char const* text) { m_buffer[0] = '\0', String::Assign(text); }
-    StaticString(String const& text) { m_buffer[0] = '\0', String::Assign(text); }
+    StaticString(char const* text) {
+        m_buffer[0] = '\0';
+        String::Assign(text);
+    }
+    StaticString(String const& text) {
+        m_buffer[0] = '\0';
+        String::Assign(text);
+    }
     StaticString(StaticString const& other) : String() {
         m_buffer[0] = '\0';
         String::Assign(other);
@@ -37,6 +43,7 @@ public:
         InvalSizeCache();
         return m_buffer;
     }
+    /// N: the most text it holds (the array has one more byte, for the terminator).
     int GetBufferSize() const override { return N; }
     /// Always N + 1, whatever is asked: the storage cannot grow.
     int RequestBufferSize(int, bool, bool) override { return N + 1; }
@@ -45,17 +52,19 @@ private:
     char m_buffer[N + 1];
 };
 
-#if defined(_WIN32)
-#define TEKIT_EXTERN_TEMPLATE extern template class __declspec(dllimport)
-#else
-#define TEKIT_EXTERN_TEMPLATE extern template class TEKIT_API
+// The four sizes are instantiated once, inside the library, and other files refer to that
+// copy. Not on Windows: the DLL exports no member defined inside the class body, so callers
+// there instantiate the (all inline) members themselves.
+#if !defined(_WIN32)
+#define TEKIT_STATIC_STRING_EXTERN 1
 #endif
-#if !defined(TEKIT_BUILDING)
-TEKIT_EXTERN_TEMPLATE StaticString<64>;
-TEKIT_EXTERN_TEMPLATE StaticString<256>;
-TEKIT_EXTERN_TEMPLATE StaticString<260>;
-TEKIT_EXTERN_TEMPLATE StaticString<1024>;
+
+#if defined(TEKIT_STATIC_STRING_EXTERN)
+extern template class TEKIT_API StaticString<64>;
+extern template class TEKIT_API StaticString<256>;
+extern template class TEKIT_API StaticString<260>;
+extern template class TEKIT_API StaticString<1024>;
 #endif
-#undef TEKIT_EXTERN_TEMPLATE
+#undef TEKIT_STATIC_STRING_EXTERN
 
 } // namespace tekit

@@ -1,0 +1,172 @@
+// The lead-byte table and the byte-level helpers that every string operation is built on.
+#include "MultiByteFixture.h"
+
+#include "tekit/strings/DynamicString.h"
+
+#include <gtest/gtest.h>
+
+#include <cstring>
+#include <string>
+
+namespace tekit {
+namespace {
+
+using MultiByteTest = testing::MultiByteFixture;
+
+TEST_F(MultiByteTest, CodePageFillsTheLeadByteTable) {
+    SetMultiByteCodePage(932);
+    EXPECT_EQ(GetMultiByteCodePage(), 932u);
+    String::EnableMultiByteSupport(true);
+    // 0x81-0x9F and 0xE0-0xFC lead; 0xA0-0xDF (half-width katakana) do not.
+    EXPECT_EQ(DynamicString("\x81\x40\x9F\x40\xE0\x40\xFC\x40", true).GetNumChars(), 4);
+    EXPECT_EQ(DynamicString("\x80\x40\xA0\xDF\xFD", true).GetNumChars(), 5);
+
+    SetMultiByteCodePage(12345); // unknown: the table stays as it was
+    EXPECT_EQ(GetMultiByteCodePage(), 932u);
+    SetMultiByteCodePage(0);
+    EXPECT_EQ(DynamicString("\x81\x40", true).GetNumChars(), 2);
+}
+
+TEST_F(MultiByteTest, LeadByteBeforeTheTerminatorCountsAsOneByte) {
+    UseShiftJis();
+    DynamicString cut("ab\x82", true);
+    EXPECT_EQ(cut.GetNumChars(), 3);
+    EXPECT_EQ(cut.GetLastChar(), 0x82);
+    EXPECT_EQ(String::SizeOfMBCSSubString("ab\x82", -1, 10), 3);
+    EXPECT_EQ(String::SizeOfMBCSSubString("ab\x82", 10, 10), 3);
+    EXPECT_EQ(cut.CharToByteIndex(10), 3);
+    EXPECT_EQ(cut.Compare("ab\x82", false, 5), 0);
+}
+
+TEST_F(MultiByteTest, LastCharacterIsFoundByLeadBytePairing) {
+    UseShiftJis();
+    // 0x82 is both a lead byte and a valid trail byte: only pairing from the start tells.
+    DynamicString pairs("\x82\x82\x82\xA0", true); // two characters: 82 82 | 82 A0
+    EXPECT_EQ(pairs.GetLastCharPtr(), pairs.GetBufferReadPtr() + 2);
+    EXPECT_EQ(pairs.GetLastChar(), 0x82A0);
+    DynamicString single("x\x82\x82"
+                         "a",
+                         true); // x | 82 82 | a
+    EXPECT_EQ(single.GetLastCharPtr(), single.GetBufferReadPtr() + 3);
+    DynamicString trail("\x82\x41", true); // 'A' here is a trail byte, not a character
+    EXPECT_EQ(trail.GetLastCharPtr(), trail.GetBufferReadPtr());
+}
+
+TEST_F(MultiByteTest, SubStringSizeStopsAtCharacterAndByteLimits) {
+    SetMultiByteCodePage(932);
+    char const* text = "a\x82\xA0"
+                       "bc";
+    EXPECT_EQ(String::SizeOfMBCSSubString(text, 2, 100), 3);
+    EXPECT_EQ(String::SizeOfMBCSSubString(text, -1, 2), 1); // never half a character
+    EXPECT_EQ(String::SizeOfMBCSSubString(text, -1, 3), 3);
+    EXPECT_EQ(String::SizeOfMBCSSubString(text, 0, 100), 0);
+    EXPECT_EQ(String::SizeOfMBCSSubString(text, -1, -4), 0);
+    EXPECT_EQ(String::SizeOfMBCSSubString(nullptr, -1, 10), 0);
+    EXPECT_EQ(String::MBCSPtrCharacterIndex(text, text + 3), 2);
+    EXPECT_EQ(String::MBCSPtrCharacterIndex(text, text + 2), 1); // inside the character
+    EXPECT_EQ(String::MBCSPtrCharacterIndex(text, text - 1), 0);
+}
+
+TEST(StringCopyRoutines, CopyIsBoundedTerminatedAndReportsTheSize) {
+    char dest[8];
+    int cached = -1;
+    String::StringCopyMaxN(dest, "abcdefghij", 20, sizeof dest, &cached);
+    EXPECT_STREQ(dest, "abcdefg");
+    EXPECT_EQ(cached, 8);
+    String::StringCopyMaxN(dest, "abcdefghij", 3, sizeof dest, &cached);
+    EXPECT_STREQ(dest, "abc");
+    EXPECT_EQ(cached, 4);
+    String::StringCopyMax(dest, "xy", sizeof dest, &cached);
+    EXPECT_STREQ(dest, "xy");
+    EXPECT_EQ(cached, 3);
+
+    dest[0] = '#';
+    String::StringCopyMax(dest, "xy", 0, &cached);
+    EXPECT_EQ(dest[0], '#');
+    EXPECT_EQ(cached, 0);
+    String::StringCopyMax(dest, nullptr, sizeof dest, &cached);
+    EXPECT_STREQ(dest, "");
+    EXPECT_EQ(cached, 1);
+
+    char overlap[] = "0123456789";
+    String::StringCopyMaxN(overlap + 2, overlap, 5, 8, nullptr);
+    EXPECT_STREQ(overlap, "0101234");
+}
+
+TEST_F(MultiByteTest, MultibyteCopyFollowsTheModeOnlyInTheSafeForm) {
+    SetMultiByteCodePage(932);
+    char dest[4];
+    int cached = 0;
+    String::MBCSStringCopyMax(dest, "ab\x82\xA0", sizeof dest, &cached);
+    EXPECT_STREQ(dest, "ab");
+    EXPECT_EQ(cached, 3);
+    String::MBCSStringCopyMaxN(dest, "\x82\xA0\x82\xA2", 3, sizeof dest, &cached);
+    EXPECT_STREQ(dest, "\x82\xA0");
+    String::MBSafeStringCopyMax(dest, "ab\x82\xA0", sizeof dest, &cached);
+    EXPECT_STREQ(dest, "ab\x82"); // mode off: bytes
+    String::EnableMultiByteSupport(true);
+    String::MBSafeStringCopyMax(dest, "ab\x82\xA0", sizeof dest, &cached);
+    EXPECT_STREQ(dest, "ab");
+}
+
+TEST_F(MultiByteTest, InsertionCutsWhatDoesNotFit) {
+    char dest[8] = "abcd";
+    String::StringInsert(dest, "XYZ", 2, sizeof dest);
+    EXPECT_STREQ(dest, "abXYZcd");
+    String::StringInsert(dest, "12", 1, sizeof dest);
+    EXPECT_STREQ(dest, "a12bXYZ");
+    String::StringInsert(dest, "!", 99, sizeof dest); // past the end: appended if it fits
+    EXPECT_STREQ(dest, "a12bXYZ");
+    String::StringInsert(dest, dest + 4, 0, sizeof dest); // text from the buffer itself
+    EXPECT_STREQ(dest, "XYZa12b");
+
+    SetMultiByteCodePage(932);
+    char mb[6] = "abc";
+    String::MBCSStringInsert(mb, "\x82\xA0\x82\xA2", 1, sizeof mb);
+    EXPECT_STREQ(mb, "a\x82\xA0\x82\xA2"); // the tail "bc" no longer fits
+    char tail[6] = "a\x82\xA0"
+                   "b";
+    String::MBCSStringInsert(tail, "xy", 2, sizeof tail); // inside a character: before it
+    EXPECT_STREQ(tail, "axy\x82\xA0");
+}
+
+TEST_F(MultiByteTest, RemovalClampsToTheText) {
+    char text[] = "abcdef";
+    String::StringRemove(text, 1, 2);
+    EXPECT_STREQ(text, "adef");
+    String::StringRemove(text, 2, 100);
+    EXPECT_STREQ(text, "ad");
+    String::StringRemove(text, -1, 1);
+    String::StringRemove(text, 5, 1);
+    String::StringRemove(text, 0, -3);
+    EXPECT_STREQ(text, "ad");
+
+    SetMultiByteCodePage(932);
+    char mb[] = "a\x82\xA0"
+                "b\x82\xA2"
+                "c";
+    String::MBCSStringRemove(mb, 1, 2);
+    EXPECT_STREQ(mb, "a\x82\xA2"
+                     "c");
+    String::MBCSStringRemove(mb, 1, 99);
+    EXPECT_STREQ(mb, "a");
+}
+
+TEST_F(MultiByteTest, CaseChangesLeaveDoubleByteCharactersAlone) {
+    SetMultiByteCodePage(932);
+    char text[] = "ab\x82\x61"
+                  "cd\xE4";
+    String::MBCSUpperN(text, -1);
+    EXPECT_STREQ(text, "AB\x82\x61"
+                       "CD\xE4"); // trail byte 'a' and Latin-1 0xE4 untouched
+    String::MBCSLowerN(text, 2);
+    EXPECT_STREQ(text, "ab\x82\x61"
+                       "CD\xE4");
+    String::MBCSLowerN(text, 0);
+    String::MBCSUpperN(nullptr, 3);
+    EXPECT_STREQ(text, "ab\x82\x61"
+                       "CD\xE4");
+}
+
+} // namespace
+} // namespace tekit
