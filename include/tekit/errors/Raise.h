@@ -42,8 +42,7 @@ class String;
 /// Raises the TEError that a system code maps to (fallback TE_OS_EXCEPTION), with the
 /// system's message for it as the description.
 [[noreturn]] TEKIT_API void RaiseTESystemException(unsigned int systemCode, char const* file,
-                                                   long line, char const* date,
-                                                   char const* time);
+                                                   long line, char const* date, char const* time);
 /// Raises `code` with its own message, function name "ThrowTEError".
 [[noreturn]] TEKIT_API void ThrowTEError(TEError code);
 /// Raises "32-BIT SIZE LIMITATION." as TE_INT32_OVERFLOW (signed) or TE_UINT32_OVERFLOW.
@@ -54,9 +53,9 @@ class String;
 
 /// Writes a three-line warning ("WARNING! '...") to the debug output, only when the diagnostic
 /// level is above 0. `apiFunction` may be null (then the third line is left out).
-TEKIT_API void ReportTEWarning(char const* message, char const* function,
-                               char const* apiFunction, long apiErrorCode, char const* file,
-                               long line, char const* date, char const* time);
+TEKIT_API void ReportTEWarning(char const* message, char const* function, char const* apiFunction,
+                               long apiErrorCode, char const* file, long line, char const* date,
+                               char const* time);
 
 namespace detail {
 /// The base name of a source path without directories or extension: "src/a/CopyOnWrite.cpp"
@@ -88,11 +87,11 @@ template <unsigned N> struct SourceBaseName {
         return kName.text;                                                                         \
     }())
 
-#define TE_RAISE(code, description, function)                                                     \
+#define TE_RAISE(code, description, function)                                                      \
     ::tekit::RaiseTEException((description), (function), (code), false, nullptr, 0, nullptr,       \
                               TE_FILE_BASE_NAME, __LINE__, __DATE__, __TIME__)
 #define TE_RAISE_API(code, description, function, apiFunction, apiErrorCode)                       \
-    ::tekit::RaiseTEException((description), (function), (code), false, (apiFunction),            \
+    ::tekit::RaiseTEException((description), (function), (code), false, (apiFunction),             \
                               (apiErrorCode), nullptr, TE_FILE_BASE_NAME, __LINE__, __DATE__,      \
                               __TIME__)
 /// Raises TE_PROGRAM_ERROR with the failed condition as the assertion text.

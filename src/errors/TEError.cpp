@@ -1,0 +1,364 @@
+#include "tekit/errors/TEError.h"
+
+#include <cstring>
+
+namespace tekit {
+
+namespace {
+
+#define TE_ROW(symbol, comCode)                                                                    \
+    { symbol, #symbol, comCode }
+
+/// The error table: searched linearly in this order, ended by a row with a null symbol.
+constexpr TEErrorInfo kErrorTable[] = {
+    TE_ROW(TE_OUT_OF_MEMORY, 0x8007000E),
+    TE_ROW(TE_PROGRAM_ERROR, 0x80004005),
+    TE_ROW(TE_REGISTRY_ACCESS_ERROR, 0x80040150),
+    TE_ROW(TE_REGISTRY_ITEM_NOT_FOUND, 0x80040152),
+    TE_ROW(TE_DLL_NOT_LOADABLE, 0x1F),
+    TE_ROW(TE_FUNC_NOT_IN_LIB, 0x1F),
+    TE_ROW(TE_UNABLE_TO_ALLOCATE_SYSTEM_RESOURCE, 0x8007000E),
+    TE_ROW(TE_UNABLE_TO_INITIALIZE_OLE_SYSTEM_DLLS, 0x80004005),
+    TE_ROW(TE_STACK_OVERFLOW, 0x3E9),
+    TE_ROW(TE_CONVERTED_ERROR_CODE, 0x80004005),
+    TE_ROW(TE_INT32_OVERFLOW, 0x80004005),
+    TE_ROW(TE_UINT32_OVERFLOW, 0x80004005),
+    TE_ROW(TE_EXTERNAL_SERVER_UNAVAILABLE, 0x80004005),
+    TE_ROW(TE_INT64_OVERFLOW, 0x80004005),
+    TE_ROW(TE_UINT64_OVERFLOW, 0x80004005),
+    TE_ROW(TE_NEWER_FILE_FORMAT, 0x80004005),
+    TE_ROW(TE_OUT_OF_DATE_FILE_FORMAT, 0x80004005),
+    TE_ROW(TE_BAD_FILE_FORMAT, 0x80004005),
+    TE_ROW(TE_IO_ERROR, 0x80028CA2),
+    TE_ROW(TE_UNABLE_TO_OPEN_FILE, 0x6E),
+    TE_ROW(TE_BAD_NET_PATH, 0x35),
+    TE_ROW(TE_DRIVE_NOT_READY, 0x15),
+    TE_ROW(TE_INVALID_PATHNAME, 0xA1),
+    TE_ROW(TE_ACCESS_DENIED, 0x80070005),
+    TE_ROW(TE_FILE_ALREADY_EXISTS, 0x50),
+    TE_ROW(TE_DISK_FULL, 0x70),
+    TE_ROW(TE_FILE_NOT_FOUND, 0x2),
+    TE_ROW(TE_SHARING_VIOLATION, 0x20),
+    TE_ROW(TE_WRITE_PROTECTED, 0x13),
+    TE_ROW(TE_INVALID_DRIVE, 0xF),
+    TE_ROW(TE_PATH_NOT_FOUND, 0x3),
+    TE_ROW(TE_UNABLE_TO_CLOSE_FILE, 0x80004005),
+    TE_ROW(TE_MEMORY_CHECKING, 0x80004005),
+    TE_ROW(TE_UNABLE_TO_OPEN_DIR, 0x6E),
+    TE_ROW(TE_UNEXPECTED_END_OF_FILE, 0x26),
+    TE_ROW(TE_INVALID_OR_OUT_OF_RANGE, 0x80070057),
+    TE_ROW(TE_INDEX_OUT_OF_RANGE, 0x8002000B),
+    TE_ROW(TE_NO_ITEMS_IN_LIST, 0x80004005),
+    TE_ROW(TE_TOO_MANY_ITEMS, 0x80004005),
+    TE_ROW(TE_UNRECOGNIZED_VALUE, 0x80070057),
+    TE_ROW(TE_DUPLICATE_ITEM_OR_VALUE, 0x80070057),
+    TE_ROW(TE_UNKNOWN_VAR_OR_PROP, 0x80020006),
+    TE_ROW(TE_UNKNOWN_TYPE, 0x80070057),
+    TE_ROW(TE_UNEXPECTED_TYPE, 0x80020005),
+    TE_ROW(TE_ILLEGAL_OPERATION_ON_VALUE, 0x8002000E),
+    TE_ROW(TE_ARRAY_LOCKED, 0x8002000D),
+    TE_ROW(TE_INCOMPATIBLE_PARAMETERS, 0x80020005),
+    TE_ROW(TE_UNABLE_TO_PASS_BY_REFERENCE, 0x80020005),
+    TE_ROW(TE_EXPR_TYPE_INCOMPATIBLE_WITH_PARAMETER, 0x80020005),
+    TE_ROW(TE_EXPR_VALUE_NOT_SUPERSET_OF_PARAMETER, 0x80020005),
+    TE_ROW(TE_WRONG_NUMBER_OF_PARAMETERS, 0x8002000E),
+    TE_ROW(TE_EVALUATION_CONTEXT_NOT_AVAILABLE, 0x80004005),
+    TE_ROW(TE_SINGLE_DIM_NUMERIC_ARRAY_EXPECTED, 0x80070057),
+    TE_ROW(TE_LVALUE_EXPECTED, 0x80070057),
+    TE_ROW(TE_BAD_PROP_OR_VAR_NAME, 0x80070057),
+    TE_ROW(TE_UNKNOWN_FUNCTION_OR_SEQUENCE_NAME, 0x80020006),
+    TE_ROW(TE_TYPE_MISMATCH_ERROR, 0x80020005),
+    TE_ROW(TE_BAD_EXPRESSION, 0x80070057),
+    TE_ROW(TE_INVALID_WHEN_NOT_SUSPENDED, 0x80004005),
+    TE_ROW(TE_ARRAY_INDEX_OUT_OF_BOUNDS, 0x80070057),
+    TE_ROW(TE_WRONG_NUMBER_OF_ARRAY_INDICES, 0x80070057),
+    TE_ROW(TE_MISMATCHED_ARRAY_BOUNDS, 0x80020005),
+    TE_ROW(TE_NAME_ALREADY_IN_USE, 0x80070057),
+    TE_ROW(TE_MISSING_TYPE, 0x80070057),
+    TE_ROW(TE_TYPE_CONFLICT, 0x80020005),
+    TE_ROW(TE_CURRENT_SEQFILE_NOT_AVAILABLE, 0x80004005),
+    TE_ROW(TE_ITEM_CANNOT_BE_DELETED, 0x80070005),
+    TE_ROW(TE_OBJECT_TYPE_INCOMPATIBLE_WITH_PARAMETER_SHORT_DESC, 0x80020005),
+    TE_ROW(TE_TYPE_CANNOT_BE_DELETED, 0x80070005),
+    TE_ROW(TE_TYPE_WITH_DEPENDING_INSTANCES_CANNOT_BE_DELETED, 0x80070005),
+    TE_ROW(TE_OBJECT_CANNOT_BE_ADDED, 0x80070005),
+    TE_ROW(TE_INVALID_ADAPTER_NAME, 0x80070057),
+    TE_ROW(TE_STEP_TYPE_NOT_FOUND, 0x80070057),
+    TE_ROW(TE_LWRTDLL_NOT_LOADED, 0x80004005),
+    TE_ROW(TE_READ_OBJECT_NOT_FOUND, 0x80070057),
+    TE_ROW(TE_TWO_DIM_NUMERIC_ARRAY_EXPECTED, 0x80070057),
+    TE_ROW(TE_LOOMWIRE_TYPE_NOT_SUPPORTED_IN_CRX_DESC, 0x80004005),
+    TE_ROW(TE_INVALID_REG_EXPR, 0x80070057),
+    TE_ROW(TE_ARRAY_TYPE_EXPECTED, 0x80070057),
+    TE_ROW(TE_ARRAY_DIMENSION_EXPECTED, 0x80070057),
+    TE_ROW(TE_ARRAY_DIMENSION_SIZE_EXPECTED, 0x80070057),
+    TE_ROW(TE_INVALID_POINTER, 0x80004003),
+    TE_ROW(TE_EMPTY_EXPRESSION, 0x80004005),
+    TE_ROW(TE_MISMATCHED_ITEMS, 0x80004005),
+    TE_ROW(TE_OBJECT_LOCKED, 0x80004005),
+    TE_ROW(TE_UNEXPECTED_CHANGE_COUNT, 0x80004005),
+    TE_ROW(TE_THREAD_CREATION_FAILED, 0x80004005),
+    TE_ROW(TE_OPERATION_IN_PROGRESS, 0x8000000A),
+    TE_ROW(TE_OPERATION_TIMED_OUT, 0x5B4),
+    TE_ROW(TE_OPERATION_FAILED, 0x80004005),
+    TE_ROW(TE_UNEXPECTED_SYSTEM_ERROR, 0x80004005),
+    TE_ROW(TE_OS_EXCEPTION, 0x80004005),
+    TE_ROW(TE_NOT_SUPPORTED, 0x80004005),
+    TE_ROW(TE_MODULE_LOAD_FAILURE, 0x80004005),
+    TE_ROW(TE_MODULE_NOT_SPECIFIED, 0x80004005),
+    TE_ROW(TE_SEQUENCE_ABORTED, 0x80004004),
+    TE_ROW(TE_SEQUENCE_TERMINATED, 0x80004004),
+    TE_ROW(TE_OPERATION_CANCELED, 0x80004004),
+    TE_ROW(TE_UNABLE_TO_LAUNCH_CRX, 0x80004005),
+    TE_ROW(TE_CRX_OLE_ERROR, 0x80004005),
+    TE_ROW(TE_CRX_OLE_NOTREG, 0x80004005),
+    TE_ROW(TE_CRX_AUTO_CMD_FAILED, 0x80004005),
+    TE_ROW(TE_CRX_REG_VALUE_TYPE_MISMATCH, 0x80040153),
+    TE_ROW(TE_CRX_REG_VALUE_NOT_FOUND, 0x80040152),
+    TE_ROW(TE_CRX_REG_KEY_NOT_FOUND, 0x80040152),
+    TE_ROW(TE_CRX_REG_GENERIC_READ_ERROR, 0x80040150),
+    TE_ROW(TE_CRX_MODULE_HAS_UNRESOLVED_REFERENCES, 0x8002802F),
+    TE_ROW(TE_CRX_FUNC_NOT_FOUND_IN_MODULE, 0x8002802F),
+    TE_ROW(TE_CRX_CANT_CONNECT_TO_TECRUN, 0x80004005),
+    TE_ROW(TE_CRX_UNABLE_TO_TERMINATE_USER_PROG, 0x80004005),
+    TE_ROW(TE_CRX_NON_DLL_MODULE_NOT_SUPPORTED, 0x80004005),
+    TE_ROW(TE_CRX_VERSION_NOT_SUPPORTED, 0x80004005),
+    TE_ROW(TE_DISP_UNKNOWN_INTERFACE, 0x80020001),
+    TE_ROW(TE_DISP_UNKNOWN_MEMBER_NAME, 0x80020003),
+    TE_ROW(TE_DISP_UNKNOWN_MEMBER_ID, 0x80020003),
+    TE_ROW(TE_DISP_UNKNOWN_PARAM_NAME, 0x80020004),
+    TE_ROW(TE_DISP_UNKNOWN_PARAM_ID, 0x80020004),
+    TE_ROW(TE_DISP_MISSING_PARAM_NAME, 0x8002000F),
+    TE_ROW(TE_DISP_MISSING_PARAM_ID, 0x8002000F),
+    TE_ROW(TE_WRONG_NUM_POSITIONAL_PARAMS, 0x8002000E),
+    TE_ROW(TE_DISP_MISSING_ARG, 0x80020004),
+    TE_ROW(TE_AUTO_OBJ_NOLONGER_VALID, 0x80004005),
+    TE_ROW(TE_ACTIVEX_AUTOMATION_SERVER_EXCEPTION, 0x80020009),
+    TE_ROW(TE_DISP_OBSOLETE_MEMBER_DESC, 0x80004005),
+    TE_ROW(TE_REMOTE_SEQUENCE_ERROR, 0x80004005),
+    TE_ROW(TE_REMOTE_SEQUENCE_ERROR_UNABLE_TO_CONNECT, 0x8000401D),
+    TE_ROW(TE_REMOTE_SEQUENCE_REMOTE_EXECUTION_DENIED, 0x80070005),
+    TE_ROW(TE_REMOTE_HOST_NOT_SPECIFIED, 0x80070057),
+    TE_ROW(TE_FILE_NOT_CONVERTABLE_TO_SEQFILE, 0x80004005),
+    TE_ROW(TE_TYPE_PALETTE_FILE_LOAD_ERRORS, 0x80004005),
+    TE_ROW(TE_LW_AUTO_SERVER_ERR, 0x80004005),
+    TE_ROW(TE_LW_REPORTED_ERR, 0x80004005),
+    TE_ROW(TE_LW_MISSING_REQUIRED_ARG, 0x80004005),
+    TE_ROW(TE_LW_RUN_TIME_ENGINE_ERR, 0x80004005),
+    TE_ROW(TE_LW_TYPE_CONVERSION_ERR, 0x80004005),
+    TE_ROW(TE_LW_VI_ABORTED_ERR, 0x80004005),
+    TE_ROW(TE_RSTRING_NOT_FOUND, 0x80070057),
+    TE_ROW(TE_DDE_FAIL, 0x80004005),
+    TE_ROW(TE_NO_FILE_ASSOC, 0x80004005),
+    TE_ROW(TE_ADAPTER_NO_CONNECT_TO_AUTO_SERVER, 0x80004005),
+    TE_ROW(TE_ADAPTER_SERVER_CONNECTION_LOST, 0x80004005),
+    TE_ROW(TE_FAIL_TO_REGISTER_CLIPFORMAT, 0x80004005),
+    TE_ROW(TE_TYPE_LIBRARY_READ_ERROR, 0x80028CA2),
+    TE_ROW(TE_DOES_NOT_HAVE_PRIVILEGE, 0x80070005),
+    TE_ROW(TE_SOURCE_CODE_CONTROL_ERROR, 0x80004005),
+    TE_ROW(TE_WATCHEXPRESSION_ERROR, 0x80004005),
+    TE_ROW(TE_GAUGEKIT_INTERFACE_NOT_FOUND, 0x80004005),
+    TE_ROW(TE_METHOD_OR_PROP_NOT_AVAILABLE, 0x80004005),
+    TE_ROW(TE_VISUAL_STUDIO_AUTOMATION_ERROR, 0x80004005),
+    TE_ROW(TE_LW_KPX_AUTO_SERVER_ERR, 0x80004005),
+    TE_ROW(TE_LW_KPX_REPORTED_ERR, 0x80004005),
+    TE_ROW(TE_LW_KPX_MISSING_REQUIRED_ARG, 0x80004005),
+    TE_ROW(TE_LW_KPX_RUN_TIME_ENGINE_ERR, 0x80004005),
+    TE_ROW(TE_LW_KPX_TYPE_CONVERSION_ERR, 0x80004005),
+    TE_ROW(TE_LW_KPX_RTEDLL_NOT_LOADED, 0x80004005),
+    TE_ROW(TE_LW_KPX_AUTO_BUILD_ERR, 0x80004005),
+    TE_ROW(TE_XML_ERROR, 0x80004005),
+    TE_ROW(TE_DNASSEMBLY_MISSING, 0x80004005),
+    {TE_NO_ERROR, nullptr, 0x80004005},
+};
+
+#undef TE_ROW
+
+constexpr std::uint32_t kEFail = 0x80004005;
+char const* const kErrorSection = "TE_ERRORS";
+char const* const kUserDefinedKey = "USER_DEFINED_ERR_CODE";
+char const* const kMissingTextDefault = "Internal Error, error code string not in table";
+
+TEErrorInfo const* FindRow(TEError code) {
+    for (TEErrorInfo const* row = kErrorTable; row->symbol; ++row)
+        if (row->code == code)
+            return row;
+    return nullptr;
+}
+
+struct SystemCodeRow {
+    unsigned int systemCode;
+    TEError code;
+};
+
+/// Win32 errors and HRESULTs with a TEError of their own.
+constexpr SystemCodeRow kSystemCodes[] = {
+    {2, TE_FILE_NOT_FOUND},
+    {3, TE_PATH_NOT_FOUND},
+    {5, TE_ACCESS_DENIED},
+    {65, TE_ACCESS_DENIED},
+    {0x80070005, TE_ACCESS_DENIED},
+    {8, TE_OUT_OF_MEMORY},
+    {14, TE_OUT_OF_MEMORY},
+    {0x8007000E, TE_OUT_OF_MEMORY},
+    {15, TE_INVALID_DRIVE},
+    {19, TE_WRITE_PROTECTED},
+    {21, TE_DRIVE_NOT_READY},
+    {32, TE_SHARING_VIOLATION},
+    {39, TE_DISK_FULL},
+    {112, TE_DISK_FULL},
+    {53, TE_BAD_NET_PATH},
+    {58, TE_BAD_NET_PATH},
+    {240, TE_BAD_NET_PATH},
+    {80, TE_FILE_ALREADY_EXISTS},
+    {183, TE_FILE_ALREADY_EXISTS},
+    {110, TE_UNABLE_TO_OPEN_FILE},
+    {123, TE_INVALID_PATHNAME},
+    {161, TE_INVALID_PATHNAME},
+    {1155, TE_NO_FILE_ASSOC},
+    {1156, TE_DDE_FAIL},
+    {1157, TE_DLL_NOT_LOADABLE},
+    {1223, TE_OPERATION_CANCELED},
+    {0x80004003, TE_INVALID_POINTER},
+    {0x80020005, TE_TYPE_MISMATCH_ERROR},
+};
+
+/// TEError by C runtime errno (the Windows runtime's numbering). Some pairings are loose on
+/// purpose: 8 (exec format error) is a bad file format, 7 (argument list too long) too many
+/// items, 25 and 41 an illegal operation on a value. Values not listed fail the operation.
+TEError ErrnoRow(int crtErrno) {
+    switch (crtErrno) {
+    case 0:
+        return TE_NO_ERROR;
+    case 1:
+    case 13:
+        return TE_ACCESS_DENIED;
+    case 2:
+        return TE_FILE_NOT_FOUND;
+    case 3:
+    case 6:
+    case 9:
+    case 14:
+    case 19:
+    case 20:
+    case 21:
+    case 22:
+    case 29:
+    case 33:
+    case 34:
+    case 38:
+    case 42:
+    case 80:
+        return TE_INVALID_OR_OUT_OF_RANGE;
+    case 4:
+    case 5:
+    case 18:
+    case 27:
+        return TE_IO_ERROR;
+    case 7:
+        return TE_TOO_MANY_ITEMS;
+    case 8:
+        return TE_BAD_FILE_FORMAT;
+    case 10:
+    case 23:
+    case 24:
+    case 31:
+    case 36:
+    case 39:
+        return TE_UNABLE_TO_ALLOCATE_SYSTEM_RESOURCE;
+    case 11:
+    case 12:
+        return TE_OUT_OF_MEMORY;
+    case 17:
+        return TE_FILE_ALREADY_EXISTS;
+    case 25:
+    case 41:
+        return TE_ILLEGAL_OPERATION_ON_VALUE;
+    case 28:
+        return TE_DISK_FULL;
+    case 30:
+        return TE_WRITE_PROTECTED;
+    default: // 16, 32, 40 and every other value
+        return TE_OPERATION_FAILED;
+    }
+}
+
+} // namespace
+
+TEErrorInfo const* GetTEErrorTable() {
+    return kErrorTable;
+}
+
+char const* TEErrorToStringSymbol(TEError code) {
+    TEErrorInfo const* row = FindRow(code);
+    return row ? row->symbol : "";
+}
+
+TEError TEErrorFromStringSymbol(char const* symbol, bool* found) {
+    if (found)
+        *found = false;
+    if (!symbol)
+        return TE_NO_ERROR;
+    for (TEErrorInfo const* row = kErrorTable; row->symbol; ++row)
+        if (std::strcmp(row->symbol, symbol) == 0) {
+            if (found)
+                *found = true;
+            return row->code;
+        }
+    return TE_NO_ERROR;
+}
+
+RString TEErrorToRString(TEError code, char const* defaultText, bool* found) {
+    if (found)
+        *found = true;
+    TEErrorInfo const* row = FindRow(code);
+    RString text(kErrorSection, row ? row->symbol : kUserDefinedKey,
+                 defaultText ? defaultText : kMissingTextDefault, found);
+    if (!row && found)
+        *found = false;
+    return text;
+}
+
+std::uint32_t GetWinErrorCode(TEError code) {
+    TEErrorInfo const* row = FindRow(code);
+    return row ? row->comCode : kEFail;
+}
+
+TEError SystemErrorCodeToTEError(unsigned int systemCode, TEError fallback) {
+    for (SystemCodeRow const& row : kSystemCodes)
+        if (row.systemCode == systemCode)
+            return row.code;
+    return fallback;
+}
+
+TEError Win32FileIOErrorToTEError(unsigned int systemCode) {
+    return SystemErrorCodeToTEError(systemCode, TE_IO_ERROR);
+}
+
+TEError ErrnoToTEError(int crtErrno) {
+    return ErrnoRow(crtErrno);
+}
+
+bool IsSyntaxError(TEError code) {
+    return code == TE_BAD_EXPRESSION || code == TE_EMPTY_EXPRESSION;
+}
+
+bool IsEvaluationError(TEError code) {
+    switch (code) {
+    case TE_UNKNOWN_TYPE:
+    case TE_UNEXPECTED_TYPE:
+    case TE_TYPE_MISMATCH_ERROR:
+    case TE_WRONG_NUMBER_OF_PARAMETERS:
+    case TE_WRONG_NUMBER_OF_ARRAY_INDICES:
+    case TE_FUNC_NOT_IN_LIB:
+        return true;
+    default:
+        return false;
+    }
+}
+
+bool IsEvaluationWarning(TEError code) {
+    return code != TE_NO_ERROR && !IsSyntaxError(code) && !IsEvaluationError(code);
+}
+
+} // namespace tekit

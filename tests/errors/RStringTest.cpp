@@ -1,0 +1,207 @@
+#include "tekit/errors/RString.h"
+
+#include "tekit/strings/StaticString.h"
+#include "tekit/strings/StringVector.h"
+
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <atomic>
+#include <cctype>
+#include <cstring>
+#include <memory>
+#include <string>
+#include <thread>
+#include <vector>
+
+using namespace tekit;
+
+namespace {
+
+/// Every test starts and ends with the built-in table.
+class MessageTable : public ::testing::Test {
+protected:
+    void SetUp() override { RString::ResetStrings(); }
+    void TearDown() override { RString::ResetStrings(); }
+};
+
+std::vector<std::string> Keys(char const* section) {
+    StringVector keys;
+    RString::GetSectionTags(section, keys);
+    std::vector<std::string> out;
+    for (DynamicString const& key : keys)
+        out.emplace_back(key.GetBufferReadPtr());
+    return out;
+}
+
+} // namespace
+
+TEST_F(MessageTable, FoundMessageRefersIntoTheTableAndIsNotOwned) {
+    bool found = false;
+    auto first = std::make_unique<RString>("ERR_DESCR", "CANT_FIND_FILE", "default", &found);
+    EXPECT_TRUE(found);
+    EXPECT_STREQ(*first, "Could not find file '%1'.");
+    RString const second("ERR_DESCR", "CANT_FIND_FILE");
+    EXPECT_EQ(&first->GetString(), &second.GetString());
+    first.reset(); // must not free the table's text
+    EXPECT_STREQ(second, "Could not find file '%1'.");
+    EXPECT_STREQ(RString(second), "Could not find file '%1'.");
+}
+
+TEST_F(MessageTable, DefaultTextIsCopiedAndOwned) {
+    char text[] = "caller's default";
+    bool found = true;
+    auto message = std::make_unique<RString>("ERR_DESCR", "NO_SUCH_KEY", text, &found);
+    EXPECT_FALSE(found);
+    text[0] = 'X';
+    EXPECT_STREQ(*message, "caller's default");
+    EXPECT_NE(static_cast<char const*>(*message), text);
+
+    RString copy(*message);
+    RString assigned("ERRORS", "STRING_NOT_IN_TABLE");
+    assigned = *message;
+    message.reset(); // the copies own texts of their own
+    EXPECT_STREQ(copy, "caller's default");
+    EXPECT_STREQ(assigned, "caller's default");
+    RString moved(std::move(copy));
+    EXPECT_STREQ(moved, "caller's default");
+}
+
+TEST_F(MessageTable, MissingKeyWithoutDefaultShowsTheTablesOwnMessage) {
+    bool found = true;
+    EXPECT_STREQ(RString("ERR_DESCR", "NO_SUCH_KEY", nullptr, &found),
+                 "String not found in the language resource files");
+    EXPECT_FALSE(found);
+    EXPECT_STREQ(RString(nullptr, nullptr), "String not found in the language resource files");
+    RString::SetString("ERRORS", "STRING_NOT_IN_TABLE", "Texte introuvable");
+    EXPECT_STREQ(RString("ERR_DESCR", "NO_SUCH_KEY"), "Texte introuvable");
+}
+
+TEST_F(MessageTable, WithoutATableOnlyTheConstantOrTheDefaultShows) {
+    RString::RemoveGlobalStringTable();
+    bool found = true;
+    EXPECT_STREQ(RString("ERR_DESCR", "CANT_FIND_FILE", nullptr, &found),
+                 "String Not Found In Table");
+    EXPECT_FALSE(found);
+    EXPECT_STREQ(RString("ERR_DESCR", "CANT_FIND_FILE", "fallback"), "fallback");
+    EXPECT_FALSE(RString::GlobalStringTableIsReady());
+    RString::InitGlobalStringTable();
+    EXPECT_STREQ(RString("ERR_DESCR", "CANT_FIND_FILE"), "Could not find file '%1'.");
+}
+
+TEST_F(MessageTable, LoadedRowsAddAndReplaceUntilReset) {
+    RString const before("ERR_DESCR", "CANT_FIND_FILE");
+    RString::SetString("ERR_DESCR", "CANT_FIND_FILE", "Fichier '%1' introuvable.");
+    RString::SetString("MY_SECTION", "GREETING", "Hello");
+    bool found = false;
+    EXPECT_STREQ(RString("MY_SECTION", "GREETING", nullptr, &found), "Hello");
+    EXPECT_TRUE(found);
+    EXPECT_STREQ(RString("ERR_DESCR", "CANT_FIND_FILE"), "Fichier '%1' introuvable.");
+    EXPECT_STREQ(before, "Could not find file '%1'."); // a handle keeps its text until reset
+    EXPECT_STREQ(RString("my_section", "GREETING", "none"), "none");
+
+    RString::ResetStrings();
+    EXPECT_STREQ(RString("ERR_DESCR", "CANT_FIND_FILE"), "Could not find file '%1'.");
+    EXPECT_STREQ(RString("MY_SECTION", "GREETING", "gone"), "gone");
+}
+
+TEST_F(MessageTable, IsReadyOnlyBetweenFinishedLoadingAndTheNextResetOrRemoval) {
+    EXPECT_FALSE(RString::GlobalStringTableIsReady());
+    RString::FinishedLoadingStrings();
+    EXPECT_TRUE(RString::GlobalStringTableIsReady());
+    RString::ResetStrings();
+    EXPECT_FALSE(RString::GlobalStringTableIsReady());
+    RString::FinishedLoadingStrings();
+    RString::RemoveGlobalStringTable();
+    EXPECT_FALSE(RString::GlobalStringTableIsReady());
+}
+
+TEST_F(MessageTable, SectionTagsListEveryKeyOfASectionInOrder) {
+    std::vector<std::string> const errors = Keys("TE_ERRORS");
+    EXPECT_EQ(errors.size(), 159u); // every TEError symbol and USER_DEFINED_ERR_CODE
+    EXPECT_TRUE(std::is_sorted(errors.begin(), errors.end()));
+    EXPECT_EQ(std::count(errors.begin(), errors.end(), "USER_DEFINED_ERR_CODE"), 1);
+
+    EXPECT_EQ(Keys("ERRORS").front(), "STRING_NOT_IN_TABLE");
+    RString::SetString("ERRORS", "A_NEW_KEY", "text");
+    EXPECT_EQ(Keys("ERRORS").front(), "A_NEW_KEY");
+
+    StringVector keys(3);
+    RString::GetSectionTags("NO_SUCH_SECTION", keys);
+    EXPECT_TRUE(keys.empty());
+}
+
+TEST_F(MessageTable, BuiltInDescriptionsKeepTheirExactTextsAndPlaceholders) {
+    struct Row {
+        char const* key;
+        char const* text;
+    };
+    Row const rows[] = {
+        {"COMPRESS_OP_FAILED",
+         "Unable to perform compression or decompression operation (code: %1)."},
+        {"PATH_IS_EMPTY", "Path is empty."},
+        {"PATH_SEP_MUST_FOLLOW_DRIVE_SPEC", "Path separator (\\) must follow drive specification."},
+        {"PATH_HAS_EMPTY_COMPONENT", "Path contains two adjacent path separators (\\\\)."},
+        {"PATH_HAS_INVALID_CHARS",
+         "One or more path components contain invalid characters: (< > | : / \\ \" * ?)."},
+        {"UNC_PATH_MISSING_DIRECTORY", "Path missing directory name after the network name."},
+        {"INVALID_PATHNAME_1", "Invalid path: '%1'"},
+        {"PATH_NOT_ABSOLUTE_1", "The path is not absolute: '%1'"},
+        {"ERR_RANGE_OPEN_ENDED_MUST_BE_LAST_1_2",
+         "Error parsing range '%1'.  Open-ended element '%2' is not the final item in the list."},
+        {"REGEXPR_EmptyLeftSide", "Left side of '|' is empty"},
+    };
+    for (Row const& row : rows) {
+        bool found = false;
+        EXPECT_STREQ(RString("ERR_DESCR", row.key, nullptr, &found), row.text) << row.key;
+        EXPECT_TRUE(found) << row.key;
+    }
+    // A key that ends in argument numbers ("..._1_2") has a placeholder for each of them.
+    for (std::string const& key : Keys("ERR_DESCR")) {
+        std::string const text = RString("ERR_DESCR", key.c_str()).GetString().GetBufferReadPtr();
+        for (size_t end = key.size();
+             end > 1 && std::isdigit((unsigned char)key[end - 1]) && key[end - 2] == '_'; end -= 2)
+            EXPECT_NE(text.find(std::string("%") + key[end - 1]), std::string::npos) << key;
+    }
+}
+
+TEST_F(MessageTable, ConcatenationsGiveDynamicStrings) {
+    RString const a("ERR_DESCR", "PATH_IS_EMPTY");
+    RString const b("ERRORS", "NO_KEY", " (see log)");
+    StaticString<64> const text("Note: ");
+    EXPECT_STREQ((a + b).GetBufferReadPtr(), "Path is empty. (see log)");
+    EXPECT_STREQ((text + a).GetBufferReadPtr(), "Note: Path is empty.");
+    EXPECT_STREQ((a + text).GetBufferReadPtr(), "Path is empty.Note: ");
+    EXPECT_STREQ((a + "!").GetBufferReadPtr(), "Path is empty.!");
+    EXPECT_STREQ(("> " + a).GetBufferReadPtr(), "> Path is empty.");
+    EXPECT_STREQ((a + L" wide").GetBufferReadPtr(), "Path is empty. wide");
+    EXPECT_STREQ(a, "Path is empty."); // the operands are unchanged
+}
+
+TEST_F(MessageTable, ManyThreadsLookUpWhileRowsAreAdded) {
+    std::atomic<int> mismatches{0};
+    std::atomic<bool> stop{false};
+    std::thread writer([&] {
+        for (int i = 0; !stop; ++i)
+            RString::SetString("LOAD", ("KEY" + std::to_string(i % 50)).c_str(), "loaded");
+    });
+    std::vector<std::thread> readers;
+    for (int t = 0; t < 6; ++t)
+        readers.emplace_back([&] {
+            for (int i = 0; i < 3000; ++i) {
+                RString const file("ERR_DESCR", "CANT_FIND_FILE");
+                RString const code("TE_ERRORS", "TE_FILE_NOT_FOUND");
+                RString const missing("ERR_DESCR", "NOT_THERE", "default");
+                if (std::strcmp(file, "Could not find file '%1'.") != 0 ||
+                    std::strcmp(code, "File not found.") != 0 ||
+                    std::strcmp(missing, "default") != 0)
+                    ++mismatches;
+            }
+        });
+    for (std::thread& reader : readers)
+        reader.join();
+    stop = true;
+    writer.join();
+    EXPECT_EQ(mismatches.load(), 0);
+    EXPECT_STREQ(RString("LOAD", "KEY0"), "loaded");
+}

@@ -1,0 +1,240 @@
+#include "tekit/errors/TEError.h"
+
+#include "platform/Platform.h"
+
+#include <gtest/gtest.h>
+
+#include <cerrno>
+#include <cstring>
+#include <map>
+#include <string>
+#include <utility>
+#include <vector>
+
+using namespace tekit;
+
+namespace {
+
+int CountRows() {
+    int n = 0;
+    while (GetTEErrorTable()[n].symbol)
+        ++n;
+    return n;
+}
+
+} // namespace
+
+TEST(ErrorTable, HoldsEveryCodeOnceInDecreasingOrderEndedByANullRow) {
+    TEErrorInfo const* table = GetTEErrorTable();
+    int const n = CountRows();
+    ASSERT_EQ(n, 158);
+    EXPECT_EQ(table[0].code, TE_OUT_OF_MEMORY);
+    EXPECT_STREQ(table[0].symbol, "TE_OUT_OF_MEMORY");
+    EXPECT_EQ(table[n - 1].code, -18700);
+    EXPECT_STREQ(table[n - 1].symbol, "TE_DNASSEMBLY_MISSING");
+    for (int i = 0; i < n; ++i) {
+        if (i > 0) {
+            EXPECT_LT(table[i].code, table[i - 1].code) << table[i].symbol;
+        }
+        EXPECT_GE(table[i].code, -18700);
+        EXPECT_LE(table[i].code, -17000);
+        bool found = false;
+        EXPECT_EQ(TEErrorFromStringSymbol(table[i].symbol, &found), table[i].code);
+        EXPECT_TRUE(found);
+        EXPECT_STREQ(TEErrorToStringSymbol(table[i].code), table[i].symbol);
+    }
+}
+
+TEST(ErrorTable, SixtyNineRowsReportEFailAndTheOthersTheirOwnComCode) {
+    int eFail = 0;
+    for (TEErrorInfo const* row = GetTEErrorTable(); row->symbol; ++row)
+        eFail += row->comCode == 0x80004005u;
+    EXPECT_EQ(eFail, 69);
+
+    std::map<TEError, std::uint32_t> const expected = {
+        {TE_OUT_OF_MEMORY, 0x8007000E},
+        {TE_REGISTRY_ACCESS_ERROR, 0x80040150},
+        {TE_CRX_REG_KEY_NOT_FOUND, 0x80040152},
+        {TE_FUNC_NOT_IN_LIB, 0x1F},
+        {TE_STACK_OVERFLOW, 0x3E9},
+        {TE_TYPE_LIBRARY_READ_ERROR, 0x80028CA2},
+        {TE_INVALID_PATHNAME, 0xA1},
+        {TE_FILE_NOT_FOUND, 0x2},
+        {TE_UNEXPECTED_END_OF_FILE, 0x26},
+        {TE_OPERATION_TIMED_OUT, 0x5B4},
+        {TE_DOES_NOT_HAVE_PRIVILEGE, 0x80070005},
+        {TE_INVALID_POINTER, 0x80004003},
+        {TE_OPERATION_CANCELED, 0x80004004},
+        {TE_OPERATION_IN_PROGRESS, 0x8000000A},
+        {TE_INDEX_OUT_OF_RANGE, 0x8002000B},
+        {TE_WRONG_NUM_POSITIONAL_PARAMS, 0x8002000E},
+        {TE_UNKNOWN_FUNCTION_OR_SEQUENCE_NAME, 0x80020006},
+        {TE_DISP_UNKNOWN_MEMBER_ID, 0x80020003},
+        {TE_DISP_MISSING_ARG, 0x80020004},
+        {TE_CRX_FUNC_NOT_FOUND_IN_MODULE, 0x8002802F},
+        {TE_OBJECT_TYPE_INCOMPATIBLE_WITH_PARAMETER_SHORT_DESC, 0x80020005},
+        {TE_RSTRING_NOT_FOUND, 0x80070057},
+        {TE_UNEXPECTED_CHANGE_COUNT, 0x80004005},
+        {TE_DNASSEMBLY_MISSING, 0x80004005},
+    };
+    for (auto const& [code, comCode] : expected)
+        EXPECT_EQ(GetWinErrorCode(code), comCode) << TEErrorToStringSymbol(code);
+}
+
+TEST(ErrorTable, CodesOutsideTheTableHaveNoSymbolAndReportEFail) {
+    for (TEError code : {TEError(0), TEError(-1), TEError(-17015), TEError(-17350)}) {
+        EXPECT_STREQ(TEErrorToStringSymbol(code), "");
+        EXPECT_EQ(GetWinErrorCode(code), 0x80004005u);
+    }
+    EXPECT_EQ(GetWinErrorCode(TE_FILE_NOT_FOUND), 2u); // a bare Win32 number, no HRESULT
+    bool found = true;
+    EXPECT_EQ(TEErrorFromStringSymbol("te_file_not_found", &found), 0);
+    EXPECT_FALSE(found);
+    found = true;
+    EXPECT_EQ(TEErrorFromStringSymbol(nullptr, &found), 0);
+    EXPECT_FALSE(found);
+    EXPECT_EQ(TEErrorFromStringSymbol("TE_DISK_FULL", nullptr), TE_DISK_FULL);
+}
+
+TEST(ErrorMessages, EveryCodeHasItsOwnTextInTheErrorSection) {
+    RString::ResetStrings();
+    for (TEErrorInfo const* row = GetTEErrorTable(); row->symbol; ++row) {
+        bool found = false;
+        RString const text = TEErrorToRString(row->code, "no text", &found);
+        EXPECT_TRUE(found) << row->symbol;
+        EXPECT_STRNE(text, "no text") << row->symbol;
+        EXPECT_GT(std::strlen(text), 3u) << row->symbol;
+    }
+    EXPECT_STREQ(TEErrorToRString(TE_FILE_NOT_FOUND), "File not found.");
+}
+
+TEST(ErrorMessages, UnknownCodeGivesTheUserDefinedCodeTextAndNotFound) {
+    RString::ResetStrings();
+    bool found = true;
+    RString const unknown = TEErrorToRString(TEError(-1), nullptr, &found);
+    EXPECT_FALSE(found);
+    EXPECT_STREQ(unknown, RString("TE_ERRORS", "USER_DEFINED_ERR_CODE"));
+
+    // Without a message table the default text shows: the caller's, else the built-in one.
+    RString::RemoveGlobalStringTable();
+    EXPECT_STREQ(TEErrorToRString(TEError(-1)), "Internal Error, error code string not in table");
+    EXPECT_STREQ(TEErrorToRString(TE_DISK_FULL, "Disk full (default)"), "Disk full (default)");
+    RString::ResetStrings();
+}
+
+namespace {
+
+/// Each TEError with the codes that map to it.
+template <typename Code> using CodeGroups = std::vector<std::pair<TEError, std::vector<Code>>>;
+
+template <typename Code> std::map<Code, TEError> Expand(CodeGroups<Code> const& groups) {
+    std::map<Code, TEError> expanded;
+    for (auto const& [error, codes] : groups)
+        for (Code code : codes)
+            expanded[code] = error;
+    return expanded;
+}
+
+} // namespace
+
+TEST(SystemCodes, MapWin32CodesAndHResultsOrFallBack) {
+    auto const expected = Expand<unsigned>({
+        {TE_FILE_NOT_FOUND, {2}},
+        {TE_PATH_NOT_FOUND, {3}},
+        {TE_ACCESS_DENIED, {5, 65, 0x80070005}},
+        {TE_OUT_OF_MEMORY, {8, 14, 0x8007000E}},
+        {TE_INVALID_DRIVE, {15}},
+        {TE_WRITE_PROTECTED, {19}},
+        {TE_DRIVE_NOT_READY, {21}},
+        {TE_SHARING_VIOLATION, {32}},
+        {TE_DISK_FULL, {39, 112}},
+        {TE_BAD_NET_PATH, {53, 58, 240}},
+        {TE_FILE_ALREADY_EXISTS, {80, 183}},
+        {TE_UNABLE_TO_OPEN_FILE, {110}},
+        {TE_INVALID_PATHNAME, {123, 161}},
+        {TE_NO_FILE_ASSOC, {1155}},
+        {TE_DDE_FAIL, {1156}},
+        {TE_DLL_NOT_LOADABLE, {1157}},
+        {TE_OPERATION_CANCELED, {1223}},
+        {TE_INVALID_POINTER, {0x80004003}},
+        {TE_TYPE_MISMATCH_ERROR, {0x80020005}},
+    });
+    std::vector<unsigned> codes = {0x80070002, 0x80004005, 0xFFFFFFFF};
+    for (unsigned code = 0; code < 1300; ++code)
+        codes.push_back(code);
+    for (auto const& [code, error] : expected)
+        codes.push_back(code);
+    for (unsigned code : codes) {
+        auto const it = expected.find(code);
+        TEError const want = it == expected.end() ? TE_XML_ERROR : it->second;
+        EXPECT_EQ(SystemErrorCodeToTEError(code, TE_XML_ERROR), want) << code;
+    }
+    EXPECT_EQ(Win32FileIOErrorToTEError(999), TE_IO_ERROR);
+    EXPECT_EQ(Win32FileIOErrorToTEError(32), TE_SHARING_VIOLATION);
+}
+
+TEST(SystemCodes, MapRuntimeErrnoValuesInTheRuntimesNumbering) {
+    auto const expected = Expand<int>({
+        {TE_NO_ERROR, {0}},
+        {TE_ACCESS_DENIED, {1, 13}},
+        {TE_FILE_NOT_FOUND, {2}},
+        {TE_INVALID_OR_OUT_OF_RANGE, {3, 6, 9, 14, 19, 20, 21, 22, 29, 33, 34, 38, 42, 80}},
+        {TE_IO_ERROR, {4, 5, 18, 27}},
+        {TE_TOO_MANY_ITEMS, {7}},
+        {TE_BAD_FILE_FORMAT, {8}},
+        {TE_UNABLE_TO_ALLOCATE_SYSTEM_RESOURCE, {10, 23, 24, 31, 36, 39}},
+        {TE_OUT_OF_MEMORY, {11, 12}},
+        {TE_FILE_ALREADY_EXISTS, {17}},
+        {TE_ILLEGAL_OPERATION_ON_VALUE, {25, 41}},
+        {TE_DISK_FULL, {28}},
+        {TE_WRITE_PROTECTED, {30}},
+    });
+    for (int value = -5; value < 200; ++value) {
+        auto const it = expected.find(value);
+        TEError const want = it == expected.end() ? TE_OPERATION_FAILED : it->second;
+        EXPECT_EQ(ErrnoToTEError(value), want) << value;
+    }
+}
+
+#if !defined(_WIN32)
+TEST(SystemCodes, HostErrnoIsTranslatedByNameBeforeMapping) {
+    EXPECT_EQ(platform::NativeErrnoToCrtErrno(0), 0);
+    EXPECT_EQ(platform::NativeErrnoToCrtErrno(ENOENT), 2);
+    EXPECT_EQ(platform::NativeErrnoToCrtErrno(EAGAIN), 11);
+    EXPECT_EQ(platform::NativeErrnoToCrtErrno(EDEADLK), 36);
+    EXPECT_EQ(platform::NativeErrnoToCrtErrno(ENAMETOOLONG), 38);
+    EXPECT_EQ(platform::NativeErrnoToCrtErrno(ENOLCK), 39);
+    EXPECT_EQ(platform::NativeErrnoToCrtErrno(ENOSYS), 40);
+    EXPECT_EQ(platform::NativeErrnoToCrtErrno(ENOTEMPTY), 41);
+    EXPECT_EQ(platform::NativeErrnoToCrtErrno(EILSEQ), 42);
+    EXPECT_EQ(ErrnoToTEError(platform::NativeErrnoToCrtErrno(ENOSPC)), TE_DISK_FULL);
+    EXPECT_EQ(ErrnoToTEError(platform::NativeErrnoToCrtErrno(EROFS)), TE_WRITE_PROTECTED);
+    EXPECT_EQ(ErrnoToTEError(platform::NativeErrnoToCrtErrno(EMFILE)),
+              TE_UNABLE_TO_ALLOCATE_SYSTEM_RESOURCE);
+    // Host values without a runtime counterpart, or with a number the runtime uses for another
+    // error (ELOOP is 40 on Linux), must not be read as that other error.
+    EXPECT_EQ(ErrnoToTEError(platform::NativeErrnoToCrtErrno(ELOOP)), TE_OPERATION_FAILED);
+    EXPECT_EQ(ErrnoToTEError(platform::NativeErrnoToCrtErrno(ECONNRESET)), TE_OPERATION_FAILED);
+    EXPECT_EQ(ErrnoToTEError(platform::NativeErrnoToCrtErrno(9999)), TE_OPERATION_FAILED);
+}
+#endif
+
+TEST(ExpressionErrors, SyntaxAndEvaluationErrorsAreHardAndEveryOtherFailureAWarning) {
+    int syntax = 0, evaluation = 0, warnings = 0;
+    for (TEErrorInfo const* row = GetTEErrorTable(); row->symbol; ++row) {
+        int const kinds = IsSyntaxError(row->code) + IsEvaluationError(row->code) +
+                          IsEvaluationWarning(row->code);
+        EXPECT_EQ(kinds, 1) << row->symbol;
+        syntax += IsSyntaxError(row->code);
+        evaluation += IsEvaluationError(row->code);
+        warnings += IsEvaluationWarning(row->code);
+    }
+    EXPECT_EQ(syntax, 2);
+    EXPECT_EQ(evaluation, 6);
+    EXPECT_EQ(warnings, 150);
+    EXPECT_TRUE(IsSyntaxError(TE_EMPTY_EXPRESSION));
+    EXPECT_TRUE(IsEvaluationError(TE_FUNC_NOT_IN_LIB));
+    EXPECT_TRUE(IsEvaluationWarning(TE_UNKNOWN_VAR_OR_PROP));
+    EXPECT_TRUE(IsEvaluationWarning(TEError(-1)));
+    EXPECT_FALSE(IsEvaluationWarning(TE_NO_ERROR));
+}
