@@ -109,8 +109,11 @@ void String::ReplaceBytes(int byteOffset, int numBytes, char const* text, int te
         text = own.c_str();
     }
     int const newLength = length - numBytes + n;
-    int const available = RequestBufferSize(newLength + 1, true, false);
-    if (available >= newLength + 1) {
+    // Ask for room for the old text too: a shared block keeps only the bytes asked for, and the
+    // tail is moved after the resize.
+    int const needed = std::max(newLength, length) + 1;
+    int const available = RequestBufferSize(needed, true, false);
+    if (available >= needed) {
         char* p = GetBufferWritePtr();
         std::memmove(p + byteOffset + n, p + byteOffset + numBytes,
                      size_t(length - byteOffset - numBytes + 1));

@@ -128,6 +128,20 @@ TEST_F(MultiByteTest, InsertionCutsWhatDoesNotFit) {
                    "b";
     String::MBCSStringInsert(tail, "xy", 2, sizeof tail); // inside a character: before it
     EXPECT_STREQ(tail, "axy\x82\xA0");
+    char cut[8] = "abcdef";
+    String::MBCSStringInsert(cut, "\x82\xA0\x82\xA2", 5, sizeof cut); // the text itself is cut
+    EXPECT_STREQ(cut, "abcde\x82\xA0"); // a prefix of the uncut result, no old tail after it
+}
+
+TEST_F(MultiByteTest, ShrinkingACharacterOfASharedStringKeepsTheTail) {
+    SetMultiByteCodePage(932);
+    String::EnableMultiByteSupport(true);
+    DynamicString a("\x82\xA0tail", true);
+    DynamicString b(a);
+    b.MBSetChar(0, 'x');
+    EXPECT_STREQ(b.GetBufferReadPtr(), "xtail");
+    EXPECT_EQ(b.GetNumBytes(), 5);
+    EXPECT_STREQ(a.GetBufferReadPtr(), "\x82\xA0tail");
 }
 
 TEST_F(MultiByteTest, RemovalClampsToTheText) {

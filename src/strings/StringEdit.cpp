@@ -1,0 +1,264 @@
+// Editing a string in place: sub-strings, replacement, truncation, trimming, appending with a
+// separator, and the fallback for a placeholder that formatting could not find.
+//
+// Every member leaves the string untouched (no write pointer taken, so a shared block is not
+// copied) when it changes nothing, takes its text arguments aside when they point into the
+// string itself, and keeps the cached size exact.
+#include "strings/CharScan.h"
+#include "strings/MultiByte.h"
+#include "strings/TextEdit.h"
+#include "strings/TextSearch.h"
+#include "tekit/errors/Raise.h"
+#include "tekit/strings/String.h"
+
+#include <climits>
+#include <cstring>
+#include <string>
+
+namespace tekit {
+
+namespace {
+
+int Length(char const* text) {
+    return text ? static_cast<int>(std::strlen(text)) : 0;
+}
+
+/// Bytes of `numChars` characters from byte `offset` (negative count: to the end).
+int BytesOfChars(char const* text, int textBytes, int offset, int numChars, bool mb) {
+    if (numChars < 0)
+        return textBytes - offset;
+    if (mb)
+        return mbcs::NBCnt(text + offset, numChars);
+    return std::min(numChars, textBytes - offset);
+}
+
+} // namespace
+
+// ---- Sub-strings ------------------------------------------------------------------------
+
+void String::GetSubstring(int start, int numChars, String& out) const {
+    bool const mb = m_isMultiByteSupportEnabled;
+    char const* text = search::ReadPtr(*this);
+    int const numBytes = GetNumBytes();
+    int const offset = search::OffsetOfChar(text, numBytes, start, mb);
+    int const bytes = BytesOfChars(text, numBytes, offset, numChars, mb);
+    if (&out == this && offset == 0 && bytes == numBytes)
+        return;
+    // The assignment copies the bytes aside itself when `out` is this string.
+    out.AssignUsingNumBytesInsteadOfNumChars(text + offset, bytes, false);
+}
+
+void String::InsertSubstring(char const* text, int charIndex) {
+    edit::StableText const insert(*this, text, -1);
+    if (insert.size() == 0)
+        return;
+    int const numBytes = GetNumBytes();
+    int const offset = search::OffsetOfChar(search::ReadPtr(*this), numBytes, charIndex,
+                                            m_isMultiByteSupportEnabled);
+    SetCachedSize(edit::InsertBytes(*this, numBytes, offset, insert.data(), insert.size()));
+}
+
+void String::InsertSubstring(String const& text, int charIndex) {
+    edit::StableText const insert(*this, search::ReadPtr(text), text.GetNumBytes());
+    if (insert.size() == 0)
+        return;
+    int const numBytes = GetNumBytes();
+    int const offset = search::OffsetOfChar(search::ReadPtr(*this), numBytes, charIndex,
+                                            m_isMultiByteSupportEnabled);
+    SetCachedSize(edit::InsertBytes(*this, numBytes, offset, insert.data(), insert.size()));
+}
+
+void String::RemoveSubstring(int start, int numChars) {
+    bool const mb = m_isMultiByteSupportEnabled;
+    char const* text = search::ReadPtr(*this);
+    int const numBytes = GetNumBytes();
+    int const offset = search::OffsetOfChar(text, numBytes, start, mb);
+    int const bytes = BytesOfChars(text, numBytes, offset, numChars, mb);
+    if (bytes == 0)
+        return;
+    if (bytes == numBytes) {
+        Clear(); // a shared block is released rather than copied
+        return;
+    }
+    SetCachedSize(edit::RemoveBytes(*this, numBytes, offset, bytes));
+}
+
+void String::ReplaceSubstring(int start, int numChars, char const* replacement) {
+    bool const mb = m_isMultiByteSupportEnabled;
+    edit::StableText const insert(*this, replacement, -1);
+    char const* text = search::ReadPtr(*this);
+    int const numBytes = GetNumBytes();
+    int const offset = search::OffsetOfChar(text, numBytes, start, mb);
+    int const bytes = BytesOfChars(text, numBytes, offset, numChars, mb);
+    edit::Splice(*this, numBytes, offset, bytes, insert, [this](int size) { SetCachedSize(size); });
+}
+
+bool String::ReplaceSubstring(String const& find, String const& replacement, bool ignoreCase,
+                              bool wholeWordOnly) {
+    return ReplaceSubstring(search::ReadPtr(find), search::ReadPtr(replacement), ignoreCase,
+                            wholeWordOnly);
+}
+
+bool String::ReplaceSubstring(char const* find, char const* replacement, bool ignoreCase,
+                              bool wholeWordOnly) {
+    bool const mb = m_isMultiByteSupportEnabled;
+    int const numBytes = GetNumBytes();
+    search::Needle const needle{find, Length(find), ignoreCase, wholeWordOnly};
+    int const at = search::FindNext(search::ReadPtr(*this), numBytes, 0, needle, mb);
+    if (at < 0)
+        return false;
+    edit::StableText const insert(*this, replacement, -1);
+    edit::Splice(*this, numBytes, at, needle.bytes, insert,
+                 [this](int size) { SetCachedSize(size); });
+    return true;
+}
+
+// The result is built aside in one pass, so the cost is linear in the text whatever the
+// number of replacements, and a replacement is never searched again.
+int String::ReplaceAllSubstrings(char const* find, char const* replacement, bool ignoreCase,
+                                 bool wholeWordOnly) {
+    bool const mb = m_isMultiByteSupportEnabled;
+    char const* text = search::ReadPtr(*this);
+    int const numBytes = GetNumBytes();
+    search::Needle const needle{find, Length(find), ignoreCase, wholeWordOnly};
+    int at = search::FindNext(text, numBytes, 0, needle, mb);
+    if (at < 0)
+        return 0;
+    std::string const insert(replacement ? replacement : "");
+    std::string result;
+    result.reserve(size_t(numBytes));
+    int count = 0;
+    int copied = 0;
+    for (; at >= 0; at = search::FindNext(text, numBytes, copied, needle, mb)) {
+        result.append(text + copied, size_t(at - copied));
+        result += insert;
+        copied = at + needle.bytes;
+        ++count;
+    }
+    result.append(text + copied, size_t(numBytes - copied));
+    if (result.size() > size_t(INT_MAX) - 16)
+        Throw32BitOverflowException("String::ReplaceAllSubstrings", TE_FILE_BASE_NAME, __LINE__,
+                                    true);
+    AssignUsingNumBytesInsteadOfNumChars(result.c_str(), static_cast<int>(result.size()), false);
+    return count;
+}
+
+bool String::ReplaceIfEqual(char const* text, char const* replacement, bool ignoreCase) {
+    if (Compare(text ? text : "", ignoreCase) != 0)
+        return false;
+    if (std::strcmp(search::ReadPtr(*this), replacement ? replacement : "") != 0)
+        Assign(replacement ? replacement : "");
+    return true;
+}
+
+void String::TruncateToNChars(int numChars, char const* suffix) {
+    bool const mb = m_isMultiByteSupportEnabled;
+    char const* text = search::ReadPtr(*this);
+    int const numBytes = GetNumBytes();
+    int const cut = search::OffsetOfChar(text, numBytes, numChars, mb);
+    if (cut >= numBytes)
+        return;
+    edit::StableText const tail(*this, suffix, -1);
+    int const suffixChars = mb ? mbcs::Len(tail.data()) : tail.size();
+    int const keepChars = std::max(numChars, 0) - suffixChars;
+    if (tail.size() > 0 && keepChars >= 0) {
+        int const keep = search::OffsetOfChar(text, numBytes, keepChars, mb);
+        edit::Splice(*this, numBytes, keep, numBytes - keep, tail,
+                     [this](int size) { SetCachedSize(size); });
+    } else if (cut == 0) {
+        Clear();
+    } else {
+        SetCachedSize(edit::CutAt(*this, cut));
+    }
+}
+
+// ---- Trimming ---------------------------------------------------------------------------
+
+void String::TrimLeft(char const* set) {
+    bool const mb = m_isMultiByteSupportEnabled;
+    char const* text = search::ReadPtr(*this);
+    int const numBytes = GetNumBytes();
+    char const* p = text;
+    while (*p && search::IsInSet(scan::CharAt(p, mb), set, mb))
+        p += scan::CharBytes(p, mb);
+    int const skipped = static_cast<int>(p - text);
+    if (skipped == 0)
+        return;
+    if (skipped == numBytes)
+        Clear();
+    else
+        SetCachedSize(edit::RemoveBytes(*this, numBytes, 0, skipped));
+}
+
+void String::TrimRight(char const* set) {
+    bool const mb = m_isMultiByteSupportEnabled;
+    char const* text = search::ReadPtr(*this);
+    int const numBytes = GetNumBytes();
+    int end = 0;
+    if (!mb) {
+        for (end = numBytes; end > 0; --end)
+            if (!search::IsInSet(static_cast<unsigned char>(text[end - 1]), set, false))
+                break;
+    } else {
+        // Forward: the end of the last character outside the set.
+        for (char const* p = text; *p;) {
+            int const width = scan::CharBytes(p, true);
+            if (!search::IsInSet(scan::CharAt(p, true), set, true))
+                end = static_cast<int>(p - text) + width;
+            p += width;
+        }
+    }
+    if (end == numBytes)
+        return;
+    if (end == 0)
+        Clear();
+    else
+        SetCachedSize(edit::CutAt(*this, end));
+}
+
+void String::RemoveSurroundingWhiteSpace(TrimOptions options) {
+    // The right end first, so the left trim moves fewer bytes.
+    if (options & kTrimRight)
+        TrimRight(nullptr);
+    if (options & kTrimLeft)
+        TrimLeft(nullptr);
+}
+
+// ---- Appending with a separator ----------------------------------------------------------
+
+void String::Append(String const& item, char const* separator) {
+    int const itemBytes = item.GetNumBytes();
+    if (separator && *separator && !IsEmpty())
+        AppendBytes(separator, -1);
+    // Read after the separator went in: when `item` is this string its text is still the first
+    // itemBytes bytes, and AppendBytes copies them aside before writing.
+    AppendBytes(search::ReadPtr(item), itemBytes);
+}
+
+void String::AppendUsingSeparator(String const& item, char const* separator) {
+    int const itemBytes = item.GetNumBytes();
+    int skip = 0;
+    if (separator && *separator && !IsEmpty()) {
+        bool const textEnds = EndsWith(separator);
+        bool const itemStarts = item.StartsWith(separator);
+        if (textEnds && itemStarts)
+            skip = Length(separator); // both carry it: keep one
+        else if (!textEnds && !itemStarts)
+            AppendBytes(separator, -1);
+    }
+    AppendBytes(search::ReadPtr(item) + skip, itemBytes - skip);
+}
+
+// ---- Formatting fallback -----------------------------------------------------------------
+
+void String::HandleMissingFormatArgument(String const& placeholder, String const& argument) {
+    TE_WARN("Could not find argument to replace in string", "String::HandleMissingFormatArgument");
+    std::string tail(" COULD NOT FIND ");
+    tail.append(search::ReadPtr(placeholder), size_t(placeholder.GetNumBytes()));
+    tail += "TO REPLACE WITH ";
+    tail.append(search::ReadPtr(argument), size_t(argument.GetNumBytes()));
+    tail += ' ';
+    AppendBytes(tail.c_str(), static_cast<int>(tail.size()));
+}
+
+} // namespace tekit
