@@ -1,0 +1,260 @@
+#include "MultiByteFixture.h"
+#include "NumericTestSupport.h"
+
+#include "tekit/errors/DebugOutput.h"
+#include "tekit/errors/DiagnosticLevel.h"
+#include "tekit/errors/RString.h"
+#include "tekit/strings/DynamicString.h"
+#include "tekit/strings/StaticString.h"
+
+#include <gtest/gtest.h>
+
+#include <climits>
+#include <cmath>
+#include <cstdint>
+#include <limits>
+#include <string>
+
+namespace tekit {
+namespace {
+
+using MultiByteFormat = testing::MultiByteFixture;
+
+/// "%1" filled by `fill`.
+template <class F> std::string Filled(F&& fill) {
+    DynamicString s("%1");
+    fill(s);
+    return s.GetBufferReadPtr();
+}
+
+// ---- Placeholders ------------------------------------------------------------------------
+
+TEST(Placeholders, FillTheFirstOccurrenceOfTheirPlainText) {
+    DynamicString message(RString("ERR_DESCR", "CANT_FIND_FILE").GetString());
+    message.Format("C:\\data\\a.txt", 1);
+    EXPECT_STREQ(message.GetBufferReadPtr(), "Could not find file 'C:\\data\\a.txt'.");
+
+    DynamicString twice("%1 and %1", true);
+    twice.Format("x", 1);
+    EXPECT_STREQ(twice.GetBufferReadPtr(), "x and %1");
+
+    // %1 is found as text, so it also matches the start of %10.
+    DynamicString ten("%10 then %1", true);
+    ten.Format("A", 1);
+    EXPECT_STREQ(ten.GetBufferReadPtr(), "A0 then %1");
+
+    DynamicString numbered("%2-%1-%-1", true);
+    numbered.Format(DynamicString("two"), 2);
+    numbered.Format("one", 1);
+    numbered.Format("minus", -1);
+    EXPECT_STREQ(numbered.GetBufferReadPtr(), "two-one-minus");
+
+    DynamicString none("a%1b", true);
+    none.Format(static_cast<char const*>(nullptr), 1);
+    EXPECT_STREQ(none.GetBufferReadPtr(), "ab");
+}
+
+TEST(Placeholders, AMissingPlaceholderAppendsANoticeWithTheArgument) {
+    DynamicString text("No placeholders here.", true);
+    text.Format("value", 2);
+    EXPECT_STREQ(text.GetBufferReadPtr(),
+                 "No placeholders here. COULD NOT FIND %2TO REPLACE WITH value ");
+
+    StaticString<64> fixed("Short");
+    fixed.Format(DynamicString("arg"), 12);
+    EXPECT_STREQ(fixed.GetBufferReadPtr(), "Short COULD NOT FIND %12TO REPLACE WITH arg ");
+}
+
+std::string gDebugText;
+void CaptureDebugText(char const* text, void*) {
+    gDebugText += text;
+}
+
+TEST(Placeholders, AMissingPlaceholderWarnsOnlyAboveDiagnosticLevelZero) {
+    int const savedLevel = OrvaneMiscUtil::GetDiagnosticLevel();
+    SetDebugOutputSink(CaptureDebugText, nullptr);
+    gDebugText.clear();
+
+    OrvaneMiscUtil::SetDiagnosticLevel(0);
+    DynamicString quiet("text", true);
+    quiet.Format("x", 1);
+    EXPECT_EQ(gDebugText, "");
+
+    OrvaneMiscUtil::SetDiagnosticLevel(1);
+    DynamicString loud("text", true);
+    loud.Format("x", 1);
+    EXPECT_EQ(gDebugText.rfind("WARNING! 'Could not find argument to replace in string' Line ", 0),
+              0u)
+        << gDebugText;
+    EXPECT_NE(gDebugText.find(" in function String::HandleMissingFormatArgument in file "),
+              std::string::npos);
+
+    SetDebugOutputSink(nullptr, nullptr);
+    OrvaneMiscUtil::SetDiagnosticLevel(savedLevel);
+}
+
+TEST(Placeholders, AnArgumentTakenFromTheStringItselfIsCopiedFirst) {
+    DynamicString s("<%1>", true);
+    s.Format(s, 1);
+    EXPECT_STREQ(s.GetBufferReadPtr(), "<<%1>>");
+
+    StaticString<64> fixed("[%1]");
+    fixed.Format(fixed.GetBufferReadPtr() + 1, 1);
+    EXPECT_STREQ(fixed.GetBufferReadPtr(), "[%1]]");
+
+    DynamicString shared("%1!", true);
+    DynamicString copy(shared);
+    shared.Format(copy, 1);
+    EXPECT_STREQ(shared.GetBufferReadPtr(), "%1!!");
+    EXPECT_STREQ(copy.GetBufferReadPtr(), "%1!");
+}
+
+TEST_F(MultiByteFormat, PlaceholdersAfterDoubleByteCharactersAreFilled) {
+    UseShiftJis();
+    DynamicString s("\x82\xA0\x82\xA2%1\x82\xA4", true);
+    s.Format("12", 1);
+    EXPECT_STREQ(s.GetBufferReadPtr(), "\x82\xA0\x82\xA2"
+                                       "12\x82\xA4");
+    EXPECT_EQ(s.GetNumChars(), 5);
+}
+
+// ---- Typed values --------------------------------------------------------------------------
+
+TEST(TypedFormat, DefaultFormatsShowEachTypeInDecimal) {
+    EXPECT_EQ(Filled([](String& s) { s.Format(INT_MIN, 1); }), "-2147483648");
+    EXPECT_EQ(Filled([](String& s) { s.Format(-7L, 1); }), "-7");
+    EXPECT_EQ(Filled([](String& s) { s.Format(short(-32768), 1); }), "-32768");
+    EXPECT_EQ(Filled([](String& s) { s.Format('A', 1); }), "A");
+    EXPECT_EQ(Filled([](String& s) { s.Format(static_cast<unsigned char>(255), 1); }), "255");
+    EXPECT_EQ(Filled([](String& s) { s.Format(static_cast<unsigned short>(65535), 1); }), "65535");
+    EXPECT_EQ(Filled([](String& s) { s.Format(4294967295u, 1); }), "4294967295");
+    EXPECT_EQ(Filled([](String& s) { s.Format(ULONG_MAX, 1); }), std::to_string(ULONG_MAX));
+    EXPECT_EQ(Filled([](String& s) { s.Format(LLONG_MIN, 1); }), "-9223372036854775808");
+    EXPECT_EQ(Filled([](String& s) { s.Format(ULLONG_MAX, 1); }), "18446744073709551615");
+    EXPECT_EQ(Filled([](String& s) { s.Format(5, 1, nullptr); }), "5");
+}
+
+TEST(TypedFormat, FieldsShowTheValueAtTheWidthOfItsType) {
+    // Flags and precisions in general are compared with the C runtime in FormatPropertyTest.
+    EXPECT_EQ(Filled([](String& s) { s.Format(-42, 1, "%05d|%-5d"); }), "-0042|%-5d");
+    EXPECT_EQ(Filled([](String& s) { s.Format(-1, 1, "%x"); }), "ffffffff");
+    EXPECT_EQ(Filled([](String& s) { s.Format(-1LL, 1, "%X"); }), "FFFFFFFFFFFFFFFF");
+    EXPECT_EQ(Filled([](String& s) { s.Format(short(-1), 1, "%u"); }), "65535");
+    EXPECT_EQ(Filled([](String& s) { s.Format(3000000000u, 1, "%d"); }), "-1294967296");
+    EXPECT_EQ(Filled([](String& s) { s.Format('A', 1, "%d=%c"); }), "65=%c");
+}
+
+TEST(TypedFormat, AFormatThatDoesNotFitTheValueNeverReadsAMissingArgument) {
+    EXPECT_EQ(Filled([](String& s) { s.Format(42, 1, "%s and %d %n%"); }), "42 and %d %n%");
+    EXPECT_EQ(Filled([](String& s) { s.Format(42, 1, "%n%d"); }), "%n42");
+    EXPECT_EQ(Filled([](String& s) { s.Format(42, 1, "%*.*d"); }), "42");
+    EXPECT_EQ(Filled([](String& s) { s.Format(42, 1, "%f"); }), "42");
+    EXPECT_EQ(Filled([](String& s) { s.Format(42, 1, "no field"); }), "no field");
+    EXPECT_EQ(Filled([](String& s) { s.Format(42, 1, "100%% %y %"); }), "100% %y %");
+    EXPECT_EQ(Filled([](String& s) { s.Format(42, 1, "%99999d"); }).size(), 4096u);
+    EXPECT_EQ(Filled([](String& s) { s.Format(2.5, 1, kDecimalPoint_AlwaysPeriod, "%d"); }), "2.5");
+    EXPECT_EQ(Filled([](String& s) { s.Format(2.5, 1, kDecimalPoint_AlwaysPeriod, "%s|%f"); }),
+              "2.5|%f");
+}
+
+TEST(TypedFormat, DoublesAreExactAndLocaleFree) {
+    auto format = [](double value, char const* printfFormat) {
+        return Filled(
+            [&](String& s) { s.Format(value, 1, kDecimalPoint_AlwaysPeriod, printfFormat); });
+    };
+    EXPECT_EQ(format(0.1, nullptr), "0.1");
+    EXPECT_EQ(format(1e300, nullptr), "1e+300");
+    EXPECT_EQ(format(-0.0, nullptr), "-0");
+    EXPECT_EQ(format(std::numeric_limits<double>::infinity(), nullptr), "inf");
+    EXPECT_EQ(format(std::nan(""), "%F"), "NAN");
+    EXPECT_EQ(format(0.125, "%.2f"), "0.12"); // exact halves round to even, as printf does
+    EXPECT_EQ(format(1.0, "%#g"), "1.00000");
+    EXPECT_EQ(format(-1.5, "%A"), "-0X1.8P+0");
+    EXPECT_EQ(format(-1.5, "%+09.2f"), "-00001.50");
+    EXPECT_EQ(format(std::numeric_limits<double>::infinity(), "%08f"), "     inf");
+    EXPECT_EQ(format(1e308, "%.0f").size(), 309u);
+}
+
+TEST(TypedFormat, PointerSizedValuesShowAllTheirHexDigits) {
+    std::string const zeros(2 * sizeof(void*) - 4, '0');
+    EXPECT_EQ(Filled([](String& s) { s.FormatPtr(std::uintptr_t(0xBEEF), 1); }),
+              "0x" + zeros + "BEEF");
+    EXPECT_EQ(Filled([](String& s) { s.FormatPtr(std::intptr_t(-1), 1, "%d"); }), "-1");
+    DynamicString text;
+    text.AppendPtr(reinterpret_cast<void const*>(std::uintptr_t(0xBEEF)));
+    EXPECT_EQ(std::string(text.GetBufferReadPtr()), "0x" + zeros + "BEEF");
+}
+
+// ---- Appending -----------------------------------------------------------------------------
+
+TEST(AppendNumbers, EachTypeIsAppendedWithItsFormat) {
+    DynamicString s("n=", true);
+    s.Append(5);
+    s.Append(-1L, " %lx");
+    s.Append(-1LL, " %llx");
+    s.Append(ULLONG_MAX, " %llu");
+    s.Append(3.25, kDecimalPoint_AlwaysPeriod, " %.1f");
+    s.Append(0.5, kDecimalPoint_AlwaysPeriod, DynamicString(" %.3e "));
+    s.AppendSize(SIZE_MAX);
+    EXPECT_EQ(std::string(s.GetBufferReadPtr()),
+              "n=5 " + std::string(2 * sizeof(long), 'f') +
+                  " ffffffffffffffff 18446744073709551615 3.2 5.000e-01 " +
+                  std::to_string(SIZE_MAX));
+}
+
+// ---- printf --------------------------------------------------------------------------------
+
+TEST(SPrintf, WritesEveryConversionWithoutTheCRuntime) {
+    DynamicString s;
+    s.SPrintf("%s|%5.2s|%-3c|%+d|%lld|%zu|%%|%ls|%5.1f|%x|%hhd", "text", "abc", 'z', 7,
+              -9000000000LL, size_t(12), L"wide", 2.25, 255u, 300);
+    EXPECT_STREQ(s.GetBufferReadPtr(), "text|   ab|z  |+7|-9000000000|12|%|wide|  2.2|ff|44");
+
+    // The Windows runtime's length modifiers, which compilers do not check.
+    std::string const windowsFormat = "%I64d %I32u %Id";
+    s.SPrintf(windowsFormat.c_str(), -5000000000LL, 7u, std::ptrdiff_t(-3));
+    EXPECT_STREQ(s.GetBufferReadPtr(), "-5000000000 7 -3");
+
+    StaticString<64> target;
+    String::SPrintf(target, "[%*d|%-*d|%.*f]", 4, 1, 3, 2, 1, 0.25);
+    EXPECT_STREQ(target.GetBufferReadPtr(), "[   1|2  |0.2]");
+}
+
+TEST(SPrintf, NullTextsAndUnsafeFieldsAreDefused) {
+    DynamicString s;
+    int written = 12345;
+    char const* none = nullptr;
+    s.SPrintf("a%sb%nc%pd", none, &written, static_cast<void*>(nullptr));
+    EXPECT_EQ(written, 12345);
+    EXPECT_EQ(std::string(s.GetBufferReadPtr()),
+              "abc0x" + std::string(2 * sizeof(void*), '0') + "d");
+
+    DynamicString alias("abc", true);
+    alias.SPrintf("%s%s", alias.GetBufferReadPtr(), alias.GetBufferReadPtr());
+    EXPECT_STREQ(alias.GetBufferReadPtr(), "abcabc");
+
+    std::string const empty;
+    s.SPrintf(empty.empty() ? nullptr : empty.c_str());
+    EXPECT_STREQ(s.GetBufferReadPtr(), "");
+}
+
+#if !defined(_WIN32)
+TEST(SPrintf, UsesAPeriodWhateverTheProcessLocale) {
+    std::string const comma = testing::FindCommaLocale();
+    if (comma.empty())
+        GTEST_SKIP() << "no locale with a decimal comma is installed";
+    ASSERT_NE(setlocale(LC_NUMERIC, comma.c_str()), nullptr);
+    DynamicString s;
+    s.SPrintf("%.2f", 1.5);
+    DynamicString d("%1", true);
+    d.Format(1.5, 1, kDecimalPoint_AlwaysPeriod, "%g");
+    double const read = DynamicString("2.5").CvtToFloat64();
+    setlocale(LC_NUMERIC, "C");
+    EXPECT_STREQ(s.GetBufferReadPtr(), "1.50");
+    EXPECT_STREQ(d.GetBufferReadPtr(), "1.5");
+    EXPECT_EQ(read, 2.5);
+}
+#endif
+
+} // namespace
+} // namespace tekit
