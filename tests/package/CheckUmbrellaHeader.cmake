@@ -1,0 +1,25 @@
+# tekit/tekit.h includes every public header, each once, in sorted order, and nothing else.
+#
+#   cmake -DINCLUDE_DIR=<repo>/include -P CheckUmbrellaHeader.cmake
+file(GLOB headers RELATIVE ${INCLUDE_DIR} ${INCLUDE_DIR}/tekit/*/*.h)
+list(SORT headers)
+file(STRINGS ${INCLUDE_DIR}/tekit/tekit.h lines REGEX "^#include \"tekit/[^/\"]+/[^\"]+\"")
+set(included)
+foreach(line IN LISTS lines)
+  string(REGEX REPLACE "^#include \"([^\"]+)\".*" "\\1" header "${line}")
+  list(APPEND included ${header})
+endforeach()
+
+set(missing ${headers})
+list(REMOVE_ITEM missing ${included})
+set(unknown ${included})
+list(REMOVE_ITEM unknown ${headers})
+if(missing)
+  message(SEND_ERROR "tekit.h does not include: ${missing}")
+endif()
+if(unknown)
+  message(SEND_ERROR "tekit.h includes headers that do not exist: ${unknown}")
+endif()
+if(NOT missing AND NOT unknown AND NOT included STREQUAL headers)
+  message(SEND_ERROR "tekit.h: includes out of order or repeated:\n  ${included}\nexpected:\n  ${headers}")
+endif()

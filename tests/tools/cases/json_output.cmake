@@ -1,0 +1,12 @@
+# --json before the command or after it prints the same one-line object with every field.
+run_tool(--json error TE_ACCESS_DENIED EXIT 0 OUT global)
+run_tool(error TE_ACCESS_DENIED --json EXIT 0 OUT local)
+expect_equal("${local}" "${global}" "global and per-command --json")
+expect_match("${global}" "^{[^\n]*}\n$" "--json error prints one line")
+expect_json("${global}" -17205 code)
+expect_json("${global}" TE_ACCESS_DENIED symbol)
+expect_json("${global}" 0x80070005 comCode)
+string(JSON type TYPE "${global}" code)
+expect_equal("${type}" NUMBER "type of code")
+string(JSON type TYPE "${global}" message)
+expect_equal("${type}" STRING "type of message")
