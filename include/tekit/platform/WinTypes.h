@@ -15,9 +15,12 @@
 #endif
 #include <windows.h>
 #include <oaidl.h>
-#include <comutil.h>
+#include <comdef.h> // _bstr_t, with the _com_error it raises on failure
 #else
 using HANDLE = void*;
+/// A module: on POSIX any address inside the shared object (null: the program).
+using HINSTANCE = void*;
+using HMODULE = HINSTANCE;
 using DWORD = std::uint32_t;
 using HRESULT = std::int32_t;
 using ULONG = std::uint32_t;

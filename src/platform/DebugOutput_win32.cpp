@@ -1,0 +1,12 @@
+#include "platform/Platform.h"
+#include "platform/Win32.h"
+
+namespace tekit::platform {
+
+void WriteDebugText(char const* text) {
+    if (!text)
+        return;
+    ::OutputDebugStringA(text);
+}
+
+} // namespace tekit::platform
