@@ -1,0 +1,286 @@
+#include "PathTestSupport.h"
+#include "strings/MultiByteFixture.h"
+#include "tekit/paths/DynamicPath.h"
+#include "tekit/paths/Path.h"
+
+#include <string>
+
+using namespace tekit;
+using tekit::testing::TextOf;
+
+namespace {
+
+using Finder = bool (*)(String const&, int&, int&);
+
+/// "start+length" of what `find` finds in `text`, or "none" (the outputs then untouched).
+std::string Found(Finder find, std::string const& text) {
+    int start = -1, length = -1;
+    if (find(DynamicString(text.c_str(), true), start, length))
+        return std::to_string(start) + "+" + std::to_string(length);
+    return start == -1 && length == -1 ? "none" : "none, outputs written";
+}
+
+std::string Component(Path const& path, void (PathBase::*get)(String&) const) {
+    return TextOf([&](String& out) { (path.*get)(out); });
+}
+
+} // namespace
+
+TEST(PathClassification, DriveUncRootedAndRelativeForms) {
+    EXPECT_TRUE(Path("c:\\x").UsesDriveLetter());
+    EXPECT_FALSE(Path("1:\\x").UsesDriveLetter());
+    EXPECT_FALSE(Path("C").UsesDriveLetter());
+    EXPECT_TRUE(Path("\\\\srv").UsesUNC());
+    EXPECT_TRUE(PathBase::UsesUNC(DynamicString("\\\\", true)));
+    EXPECT_FALSE(PathBase::UsesUNC(DynamicString("\\a\\b", true)));
+
+    EXPECT_TRUE(Path("C:\\a").IsAbsolute());
+    EXPECT_TRUE(Path("\\\\srv\\sh").IsAbsolute());
+    EXPECT_FALSE(Path("\\a").IsAbsolute());
+    EXPECT_TRUE(Path("\\a").IsRooted());
+    EXPECT_FALSE(Path("a\\b").IsRooted());
+    EXPECT_FALSE(Path("").IsRooted());
+
+    EXPECT_TRUE(Path("C:\\").IsRootDirectory());
+    EXPECT_TRUE(Path("\\").IsRootDirectory());
+    EXPECT_TRUE(Path("\\\\srv\\share").IsRootDirectory());
+    EXPECT_TRUE(Path("\\\\srv\\share\\").IsRootDirectory());
+    EXPECT_FALSE(Path("C:\\a").IsRootDirectory());
+    EXPECT_FALSE(Path("a").IsRootDirectory());
+
+    EXPECT_FALSE(PathBase::sIsDirectory(DynamicString()));
+    EXPECT_TRUE(PathBase::sIsDirectory(DynamicString("a\\", true)));
+    EXPECT_TRUE(PathBase::sIsDirectory(DynamicString("C:", true)));
+    EXPECT_FALSE(PathBase::sIsDirectory(DynamicString("a\\b", true)));
+    EXPECT_EQ(PathBase::GetSeparatorChar(), '\\');
+    EXPECT_TRUE(PathBase::IsSeparator('\\'));
+    EXPECT_FALSE(PathBase::IsSeparator('/'));
+}
+
+TEST(PathNormalisation, DriveRelativeFormsBecomeAbsoluteOnEveryWayIn) {
+    EXPECT_STREQ(Path("C:").CStr(), "C:\\");
+    EXPECT_STREQ(Path("C:dir\\f").CStr(), "C:\\dir\\f");
+    EXPECT_STREQ(DynamicPath("x:f").CStr(), "x:\\f");
+    EXPECT_STREQ(StaticPath(DynamicString("C:", true)).CStr(), "C:\\");
+    Path path;
+    path = "D:a";
+    EXPECT_STREQ(path.CStr(), "D:\\a");
+    path.SetPathName(DynamicString("E:", true));
+    EXPECT_STREQ(path.CStr(), "E:\\");
+    path.Clear();
+    path.Append("F:g");
+    EXPECT_STREQ(path.CStr(), "F:\\g");
+    EXPECT_STREQ(Path("C:\\ok").CStr(), "C:\\ok");
+    EXPECT_STREQ(Path("dir\\C:x").CStr(), "dir\\C:x"); // only at the start
+    EXPECT_STREQ(Path(static_cast<char const*>(nullptr)).CStr(), "");
+}
+
+TEST(PathSplitting, FileNameStartsAfterTheLastSeparatorOrColon) {
+    EXPECT_EQ(Found(PathBase::FindFileName, "C:\\dir\\f.txt"), "7+5");
+    EXPECT_EQ(Found(PathBase::FindFileName, "f.txt"), "0+5");
+    EXPECT_EQ(Found(PathBase::FindFileName, "C:\\dir\\a:b"), "9+1");
+    EXPECT_EQ(Found(PathBase::FindFileName, "\\\\srv\\share"), "6+5");
+    EXPECT_EQ(Found(PathBase::FindFileName, "C:\\dir\\"), "none");
+    EXPECT_EQ(Found(PathBase::FindFileName, "C:"), "none");
+    EXPECT_EQ(Found(PathBase::FindFileName, ""), "none");
+}
+
+TEST(PathSplitting, ExtensionIncludesItsDotAndIsFoundWithin254Characters) {
+    EXPECT_EQ(Found(PathBase::FindExtension, "C:\\d\\a.tar.gz"), "10+3");
+    EXPECT_EQ(Found(PathBase::FindExtension, "C:\\d.x\\file"), "none"); // not past the file name
+    EXPECT_EQ(Found(PathBase::FindExtension, "C:\\d\\.profile"), "5+8");
+    EXPECT_EQ(Found(PathBase::FindExtension, "a."), "1+1");
+    EXPECT_EQ(Found(PathBase::FindExtension, "C:\\d\\"), "none");
+    std::string const longest = "a." + std::string(254, 'x');
+    EXPECT_EQ(Found(PathBase::FindExtension, longest), "1+255");
+    EXPECT_EQ(Found(PathBase::FindExtension, "a." + std::string(255, 'x')), "none");
+}
+
+TEST(PathSplitting, BaseNameIsTheFileNameBeforeItsExtension) {
+    EXPECT_EQ(Found(PathBase::FindBaseName, "C:\\d\\a.tar.gz"), "5+5");
+    EXPECT_EQ(Found(PathBase::FindBaseName, "C:\\d\\readme"), "5+6");
+    EXPECT_EQ(Found(PathBase::FindBaseName, "C:\\d\\.profile"), "none");
+    EXPECT_EQ(Found(PathBase::FindBaseName, "C:\\d\\"), "none");
+    std::string const tooLong = "C:\\a." + std::string(255, 'x');
+    EXPECT_EQ(Found(PathBase::FindBaseName, tooLong), "3+257"); // no extension: all of it
+}
+
+TEST(PathComponents, GettersGiveTheSplitTexts) {
+    Path const path("C:\\dir\\sub\\report.final.ini");
+    EXPECT_EQ(Component(path, &PathBase::GetDirectoryPathName), "C:\\dir\\sub");
+    EXPECT_EQ(Component(path, &PathBase::GetFileName), "report.final.ini");
+    EXPECT_EQ(Component(path, &PathBase::GetBaseName), "report.final");
+    EXPECT_EQ(Component(path, &PathBase::GetExtension), "ini");
+    EXPECT_TRUE(path.HasExtension());
+    EXPECT_TRUE(path.HasExtension("INI"));
+    EXPECT_TRUE(path.HasExtension(".ini"));
+    EXPECT_FALSE(path.HasExtension("in"));
+
+    EXPECT_EQ(Component(Path("C:\\f"), &PathBase::GetDirectoryPathName), "C:\\");
+    EXPECT_EQ(Component(Path("f"), &PathBase::GetDirectoryPathName), "");
+    EXPECT_EQ(Component(Path("C:\\a\\"), &PathBase::GetDirectoryPathName), "C:\\a");
+    EXPECT_EQ(Component(Path("C:\\a\\"), &PathBase::GetFileName), "");
+    EXPECT_EQ(Component(Path("C:\\.profile"), &PathBase::GetBaseName), "");
+    EXPECT_EQ(Component(Path("C:\\.profile"), &PathBase::GetExtension), "profile");
+    EXPECT_EQ(Component(Path("a."), &PathBase::GetExtension), "");
+    EXPECT_TRUE(Path("a.").HasExtension());
+    EXPECT_FALSE(Path("C:\\d.x\\f").HasExtension());
+    EXPECT_FALSE(Path("C:\\d.x\\f").HasExtension(nullptr));
+}
+
+TEST(PathComponents, SettersReplaceOnePartAndKeepTheRest) {
+    Path path("C:\\dir\\report.ini");
+    path.SetExtension("bak");
+    EXPECT_STREQ(path.CStr(), "C:\\dir\\report.bak");
+    path.SetExtension(".old");
+    EXPECT_STREQ(path.CStr(), "C:\\dir\\report.old");
+    path.SetExtension("");
+    EXPECT_STREQ(path.CStr(), "C:\\dir\\report");
+    path.SetExtension("txt");
+    EXPECT_STREQ(path.CStr(), "C:\\dir\\report.txt");
+    path.SetBaseName("summary");
+    EXPECT_STREQ(path.CStr(), "C:\\dir\\summary.txt");
+    path.SetFileName(DynamicString("log.csv", true));
+    EXPECT_STREQ(path.CStr(), "C:\\dir\\log.csv");
+    path.SetDirectoryPathName("D:\\archive\\");
+    EXPECT_STREQ(path.CStr(), "D:\\archive\\log.csv");
+    path.SetDirectoryPathName("E:");
+    EXPECT_STREQ(path.CStr(), "E:\\log.csv");
+    path.SetDirectoryPathName("");
+    EXPECT_STREQ(path.CStr(), "log.csv");
+
+    Path profile("C:\\.profile");
+    profile.SetBaseName("a");
+    EXPECT_STREQ(profile.CStr(), "C:\\a.profile");
+
+    Path directory("C:\\dir\\");
+    directory.SetExtension("txt"); // no file name: nothing to give an extension to
+    EXPECT_STREQ(directory.CStr(), "C:\\dir\\");
+    directory.SetFileName("f.txt");
+    EXPECT_STREQ(directory.CStr(), "C:\\dir\\f.txt");
+    Path empty;
+    empty.SetBaseName("name");
+    EXPECT_STREQ(empty.CStr(), "name");
+}
+
+TEST(PathComponents, AppendAddsOneSeparatorUnlessTheEndHasOne) {
+    Path path;
+    path.Append("a");
+    EXPECT_STREQ(path.CStr(), "a");
+    path.Append("b");
+    EXPECT_STREQ(path.CStr(), "a\\b");
+    path = "C:\\";
+    path.Append("x");
+    EXPECT_STREQ(path.CStr(), "C:\\x");
+    path.Append(DynamicString("\\y", true)); // the component goes in unchanged
+    EXPECT_STREQ(path.CStr(), "C:\\x\\\\y");
+    path = "dir\\";
+    path.Append(nullptr);
+    EXPECT_STREQ(path.CStr(), "dir\\");
+    path = "C:\\x";
+    path.Append("");
+    EXPECT_STREQ(path.CStr(), "C:\\x\\");
+}
+
+TEST(PathComponents, RemovingComponentsNeverCutsIntoTheRoot) {
+    Path path("C:\\a\\b.txt");
+    path.RemoveFileComponent();
+    EXPECT_STREQ(path.CStr(), "C:\\a");
+    path.RemoveFileComponent();
+    EXPECT_STREQ(path.CStr(), "C:\\");
+    path.RemoveFileComponent();
+    EXPECT_STREQ(path.CStr(), "C:\\");
+
+    Path unc("\\\\srv\\share");
+    unc.RemoveFileComponent();
+    EXPECT_STREQ(unc.CStr(), "\\\\srv\\share");
+    Path directory("C:\\a\\b\\");
+    directory.RemoveFileComponent();
+    EXPECT_STREQ(directory.CStr(), "C:\\a\\b\\");
+    directory.RemoveLastComponent();
+    EXPECT_STREQ(directory.CStr(), "C:\\a");
+    directory.RemoveLastComponent();
+    EXPECT_STREQ(directory.CStr(), "C:\\");
+    directory.RemoveLastComponent();
+    EXPECT_STREQ(directory.CStr(), "C:\\");
+
+    Path relative("a");
+    relative.RemoveLastComponent();
+    EXPECT_STREQ(relative.CStr(), "");
+    Path share("\\\\srv\\share\\d");
+    share.RemoveLastComponent();
+    EXPECT_STREQ(share.CStr(), "\\\\srv\\share");
+}
+
+TEST(PathComponents, TrailingSeparatorsAreStrippedExceptFromRoots) {
+    auto stripped = [](char const* text) {
+        DynamicString s(text, true);
+        PathBase::StripTrailingSeparatorIfNeeded(s);
+        return std::string(s.GetBufferReadPtr());
+    };
+    EXPECT_EQ(stripped(""), "");
+    EXPECT_EQ(stripped("\\"), "\\");
+    EXPECT_EQ(stripped("C:\\"), "C:\\");
+    EXPECT_EQ(stripped("1:\\"), "1:");
+    EXPECT_EQ(stripped("a\\\\"), "a\\");
+    EXPECT_EQ(stripped("C:\\a\\"), "C:\\a");
+    EXPECT_EQ(stripped("C:\\a"), "C:\\a");
+
+    Path path("\\\\srv\\share\\");
+    path.StripTrailingSeparator();
+    EXPECT_STREQ(path.CStr(), "\\\\srv\\share");
+}
+
+TEST(PathComponents, ConvertToDirectoryAddsTheSeparatorOnce) {
+    Path path("C:\\a");
+    EXPECT_TRUE(path.ConvertToDirectory(false));
+    EXPECT_STREQ(path.CStr(), "C:\\a\\");
+    EXPECT_TRUE(path.ConvertToDirectory(false));
+    EXPECT_STREQ(path.CStr(), "C:\\a\\");
+    Path empty;
+    EXPECT_FALSE(empty.ConvertToDirectory(false));
+    EXPECT_STREQ(empty.CStr(), "");
+    Path missing("no such directory of the tests");
+    EXPECT_FALSE(missing.ConvertToDirectory(true));
+    EXPECT_STREQ(missing.CStr(), "no such directory of the tests");
+}
+
+TEST(PathComponents, CommandFileExtensions) {
+    DynamicString extension;
+    char const* const expected[] = {"exe", "com", "cmd", "bat"};
+    ASSERT_EQ(PathBase::kNumCmdFileExtensions, 4);
+    for (long i = 0; i < PathBase::kNumCmdFileExtensions; ++i) {
+        PathBase::GetCmdFileExtension(i, extension);
+        EXPECT_EQ(extension, expected[i]);
+        EXPECT_TRUE(PathBase::IsCmdFileExtension(extension));
+    }
+    EXPECT_TRUE(PathBase::IsCmdFileExtension(DynamicString("BaT", true)));
+    EXPECT_FALSE(PathBase::IsCmdFileExtension(DynamicString(".exe", true)));
+    EXPECT_FALSE(PathBase::IsCmdFileExtension(DynamicString("exe ", true)));
+    EXPECT_FALSE(PathBase::IsCmdFileExtension(DynamicString("ps1", true)));
+    EXPECT_EQ(PathBase::kMaxFileExtensionLength, 254);
+}
+
+class PathSplittingMultiByte : public tekit::testing::MultiByteFixture {};
+
+TEST_F(PathSplittingMultiByte, IndicesCountCharactersAndTrailBytesStayInTheirCharacter) {
+    DynamicString const text("C:\\\x95\x5C\\\x82\xA0.txt", true); // C:\<表>\<あ>.txt
+    int start = -1, length = -1;
+    ASSERT_TRUE(PathBase::FindFileName(text, start, length)); // single-byte: 0x5C splits
+    EXPECT_EQ(start, 6);
+    EXPECT_EQ(length, 6);
+    UseShiftJis();
+    ASSERT_TRUE(PathBase::FindFileName(text, start, length));
+    EXPECT_EQ(start, 5);
+    EXPECT_EQ(length, 5);
+    ASSERT_TRUE(PathBase::FindExtension(text, start, length));
+    EXPECT_EQ(start, 6);
+    Path const path(text);
+    EXPECT_EQ(path.GetNumLevels(), 2);
+    EXPECT_EQ(Component(path, &PathBase::GetBaseName), "\x82\xA0");
+    EXPECT_EQ(Component(path, &PathBase::GetDirectoryPathName), "C:\\\x95\x5C");
+
+    Path directory("C:\\d\\\x95\x5C"); // ends in a character, not in a separator
+    EXPECT_FALSE(directory.IsDirectory());
+    EXPECT_EQ(Component(directory, &PathBase::GetFileName), "\x95\x5C");
+}

@@ -1,0 +1,342 @@
+// File operations against a real temporary directory. Paths are written in the host's form
+// (the library hands them to the system unchanged).
+#include "PathTestSupport.h"
+#include "tekit/paths/DynamicPath.h"
+#include "tekit/paths/Path.h"
+
+#include <cerrno>
+#include <filesystem>
+#include <fstream>
+#include <random>
+#include <sstream>
+#include <string>
+
+using namespace tekit;
+using tekit::testing::Caught;
+namespace fs = std::filesystem;
+
+namespace {
+
+#if defined(_WIN32)
+constexpr char kHostSeparator = '\\';
+#else
+constexpr char kHostSeparator = '/';
+#endif
+
+class PathFiles : public ::testing::Test {
+protected:
+    void SetUp() override {
+        std::random_device random;
+        m_root = fs::temp_directory_path() / ("tekit-paths-" + std::to_string(random()));
+        fs::create_directories(m_root);
+        m_rootText = m_root.string();
+    }
+    void TearDown() override {
+        std::error_code ignored;
+        for (auto const& entry : fs::recursive_directory_iterator(m_root, ignored))
+            fs::permissions(entry.path(), fs::perms::owner_all, fs::perm_options::add, ignored);
+        fs::remove_all(m_root, ignored);
+    }
+
+    /// The host path of `name` inside the test directory.
+    std::string At(std::string const& name) const { return m_rootText + kHostSeparator + name; }
+    void Write(std::string const& name, std::string const& contents) const {
+        std::ofstream(At(name), std::ios::binary) << contents;
+    }
+    std::string Read(std::string const& name) const {
+        std::ifstream in(At(name), std::ios::binary);
+        std::ostringstream contents;
+        contents << in.rdbuf();
+        return contents.str();
+    }
+    bool Has(std::string const& name) const { return fs::exists(At(name)); }
+    size_t NumEntries() const {
+        return size_t(std::distance(fs::directory_iterator(m_root), fs::directory_iterator()));
+    }
+
+    fs::path m_root;
+    std::string m_rootText;
+};
+
+/// "<message> <path>" of a failed file operation, as the library writes it.
+std::string Quoted(std::string const& path) {
+    return "'" + path + "'";
+}
+
+// FILETIME of 2 January 2020, 03:04:05.1234567 UTC.
+constexpr std::uint64_t kSomeTime = 132224474451234567ULL;
+
+} // namespace
+
+TEST_F(PathFiles, ExistenceSizeAndDirectories) {
+    Write("five.txt", "12345");
+    DynamicPath file(At("five.txt").c_str());
+    EXPECT_TRUE(file.Exists());
+    EXPECT_EQ(file.GetFileSize(), 5u);
+    EXPECT_FALSE(file.IsDirectory());
+    EXPECT_FALSE(file.IsReadOnly());
+    DynamicPath directory(m_rootText.c_str());
+    EXPECT_TRUE(directory.Exists());
+    EXPECT_TRUE(directory.IsDirectory());
+    EXPECT_TRUE(Path("no-such-dir\\").IsDirectory()); // the text says so
+
+    DynamicPath missing(At("missing.txt").c_str());
+    EXPECT_FALSE(missing.Exists());
+    EXPECT_FALSE(missing.IsDirectory());
+    EXPECT_FALSE(missing.IsReadOnly());
+    TEException const e = Caught([&] { missing.GetFileSize(); });
+    EXPECT_EQ(e.GetErrorCode(), TE_FILE_NOT_FOUND);
+    EXPECT_EQ(std::string(e.GetDescription()), "Could not read the information of " +
+                                                   Quoted(At("missing.txt")) + ". File not found.");
+    EXPECT_STREQ(e.GetFunctionName(), "PathBase::GetFileSize");
+#if defined(_WIN32)
+    EXPECT_STREQ(e.GetAPIFunctionName(), "GetFileAttributesExA");
+    EXPECT_EQ(e.GetAPIErrorCode(), 2);
+#else
+    EXPECT_STREQ(e.GetAPIFunctionName(), "stat");
+    EXPECT_EQ(e.GetAPIErrorCode(), ENOENT);
+#endif
+}
+
+TEST_F(PathFiles, FileTimesReadBackWhatWasSet) {
+    Write("times.txt", "t");
+    DynamicPath file(At("times.txt").c_str());
+    file.SetFileTime(PathBase::kLastWriteTime, kSomeTime);
+    EXPECT_EQ(file.GetFileTime(PathBase::kLastWriteTime), kSomeTime);
+    file.SetFileTime(PathBase::kLastAccessTime, kSomeTime + 10000000);
+    EXPECT_EQ(file.GetFileTime(PathBase::kLastAccessTime), kSomeTime + 10000000);
+    EXPECT_EQ(file.GetFileTime(PathBase::kLastWriteTime), kSomeTime); // the other one stays
+    EXPECT_NE(file.GetFileTime(PathBase::kCreationTime), 0u);
+#if defined(_WIN32)
+    file.SetFileTime(PathBase::kCreationTime, kSomeTime);
+    EXPECT_EQ(file.GetFileTime(PathBase::kCreationTime), kSomeTime);
+#else
+    std::uint64_t const created = file.GetFileTime(PathBase::kCreationTime);
+    TEException const e = Caught([&] { file.SetFileTime(PathBase::kCreationTime, kSomeTime); });
+    EXPECT_EQ(e.GetErrorCode(), TE_NOT_SUPPORTED);
+    EXPECT_EQ(file.GetFileTime(PathBase::kCreationTime), created);
+#endif
+    // Before 1970 as well.
+    file.SetFileTime(PathBase::kLastWriteTime, 100000000000000000ULL);
+    EXPECT_EQ(file.GetFileTime(PathBase::kLastWriteTime), 100000000000000000ULL);
+
+    DynamicPath missing(At("missing").c_str());
+    EXPECT_EQ(
+        Caught([&] { missing.SetFileTime(PathBase::kLastWriteTime, kSomeTime); }).GetErrorCode(),
+        TE_FILE_NOT_FOUND);
+    EXPECT_EQ(Caught([&] { missing.GetFileTime(PathBase::kLastWriteTime); }).GetErrorCode(),
+              TE_FILE_NOT_FOUND);
+}
+
+TEST_F(PathFiles, ReadOnlyFilesAreNeitherDeletedNorReplaced) {
+    Write("locked.txt", "keep");
+    Write("other.txt", "new");
+    DynamicPath locked(At("locked.txt").c_str());
+    DynamicPath other(At("other.txt").c_str());
+    locked.SetReadOnly(true);
+    EXPECT_TRUE(locked.IsReadOnly());
+
+    TEException e = Caught([&] { locked.Delete(); });
+    EXPECT_EQ(e.GetErrorCode(), TE_ACCESS_DENIED);
+    EXPECT_EQ(std::string(e.GetDescription()),
+              "Could not delete " + Quoted(At("locked.txt")) + ". Access denied.");
+    e = Caught([&] { other.CopyTo(locked, true); });
+    EXPECT_EQ(e.GetErrorCode(), TE_ACCESS_DENIED);
+    e = Caught([&] { other.MoveToReplacing(locked); });
+    EXPECT_EQ(e.GetErrorCode(), TE_ACCESS_DENIED);
+    EXPECT_EQ(Read("locked.txt"), "keep");
+    EXPECT_EQ(Read("other.txt"), "new");
+    EXPECT_EQ(NumEntries(), 2u); // no temporary copy left behind
+
+    locked.SetReadOnly(false);
+    EXPECT_FALSE(locked.IsReadOnly());
+    locked.Delete();
+    EXPECT_FALSE(Has("locked.txt"));
+    EXPECT_EQ(Caught([&] { DynamicPath(At("gone").c_str()).SetReadOnly(true); }).GetErrorCode(),
+              TE_FILE_NOT_FOUND);
+}
+
+TEST_F(PathFiles, CopyKeepsContentsAndRefusesToOverwriteUnlessAsked) {
+    Write("source.bin", std::string("a\0b\xFF", 4));
+    DynamicPath source(At("source.bin").c_str());
+    source.SetFileTime(PathBase::kLastWriteTime, kSomeTime);
+    DynamicPath copy(At("copy.bin").c_str());
+    source.CopyTo(copy, false);
+    EXPECT_EQ(Read("copy.bin"), std::string("a\0b\xFF", 4));
+    EXPECT_EQ(copy.GetFileTime(PathBase::kLastWriteTime), kSomeTime);
+
+    Write("copy.bin", "older");
+    TEException const e = Caught([&] { source.CopyTo(copy, false); });
+    EXPECT_EQ(e.GetErrorCode(), TE_FILE_ALREADY_EXISTS);
+    EXPECT_EQ(std::string(e.GetDescription()), "Could not copy " + Quoted(At("source.bin")) +
+                                                   " to " + Quoted(At("copy.bin")) +
+                                                   ". File already exists.");
+    EXPECT_STREQ(e.GetFunctionName(), "PathBase::CopyTo");
+    EXPECT_EQ(Read("copy.bin"), "older");
+    source.CopyTo(copy, true);
+    EXPECT_EQ(Read("copy.bin"), std::string("a\0b\xFF", 4));
+    EXPECT_EQ(NumEntries(), 2u);
+}
+
+TEST_F(PathFiles, FailedCopiesLeaveNothingBehind) {
+    DynamicPath target(At("target.txt").c_str());
+    TEException e = Caught([&] { DynamicPath(At("missing.txt").c_str()).CopyTo(target, true); });
+    EXPECT_EQ(e.GetErrorCode(), TE_FILE_NOT_FOUND);
+    fs::create_directory(At("folder"));
+    e = Caught([&] { DynamicPath(At("folder").c_str()).CopyTo(target, true); });
+#if defined(_WIN32)
+    EXPECT_EQ(e.GetErrorCode(), TE_ACCESS_DENIED);
+#else
+    EXPECT_EQ(e.GetErrorCode(), TE_INVALID_OR_OUT_OF_RANGE); // EISDIR
+#endif
+    Write("file.txt", "x");
+    e = Caught([&] {
+        DynamicPath(At("file.txt").c_str()).CopyTo(DynamicPath(At("folder").c_str()), true);
+    });
+    EXPECT_NE(e.GetErrorCode(), TE_NO_ERROR);
+    EXPECT_TRUE(fs::is_directory(At("folder")));
+    EXPECT_EQ(NumEntries(), 2u);
+    EXPECT_TRUE(fs::is_empty(At("folder")));
+}
+
+TEST_F(PathFiles, MoveRenamesAndRefusesAnExistingDestinationUnlessReplacing) {
+    Write("a.txt", "A");
+    Write("b.txt", "B");
+    DynamicPath a(At("a.txt").c_str());
+    DynamicPath b(At("b.txt").c_str());
+    DynamicPath c(At("c.txt").c_str());
+    TEException const e = Caught([&] { a.MoveTo(b); });
+    EXPECT_EQ(e.GetErrorCode(), TE_FILE_ALREADY_EXISTS);
+    EXPECT_EQ(std::string(e.GetDescription()), "Could not move " + Quoted(At("a.txt")) + " to " +
+                                                   Quoted(At("b.txt")) + ". File already exists.");
+    EXPECT_EQ(Read("a.txt"), "A");
+    EXPECT_EQ(Read("b.txt"), "B");
+
+    a.MoveTo(c);
+    EXPECT_FALSE(Has("a.txt"));
+    EXPECT_EQ(Read("c.txt"), "A");
+    c.MoveToReplacing(b);
+    EXPECT_FALSE(Has("c.txt"));
+    EXPECT_EQ(Read("b.txt"), "A");
+
+    EXPECT_EQ(Caught([&] { c.MoveTo(a); }).GetErrorCode(), TE_FILE_NOT_FOUND);
+    fs::create_directory(At("dir"));
+    DynamicPath(At("dir").c_str()).MoveTo(DynamicPath(At("renamed").c_str()));
+    EXPECT_TRUE(fs::is_directory(At("renamed")));
+}
+
+TEST_F(PathFiles, BackupCopySitsBesideTheFile) {
+    Write("station.ini", "v1");
+    DynamicPath file(At("station.ini").c_str());
+    DynamicPath backup;
+    file.MakeBackupCopy(backup);
+    EXPECT_EQ(std::string(backup.CStr()), At("station.ini.bak"));
+    EXPECT_EQ(Read("station.ini.bak"), "v1");
+    Write("station.ini", "v2");
+    file.MakeBackupCopy(backup);
+    EXPECT_EQ(Read("station.ini.bak"), "v2");
+    EXPECT_EQ(
+        Caught([&] { DynamicPath(At("none.ini").c_str()).MakeBackupCopy(backup); }).GetErrorCode(),
+        TE_FILE_NOT_FOUND);
+}
+
+TEST_F(PathFiles, AllDirectoriesOfAPathAreMadeOrNoneAre) {
+    std::string const nested = At(std::string("a") + kHostSeparator + "b" + kHostSeparator + "c");
+    DynamicPath(nested.c_str()).MakeAllDirectoriesInPathNameLong();
+    EXPECT_TRUE(fs::is_directory(nested));
+    DynamicPath(nested.c_str()).MakeAllDirectoriesInPathNameLong(); // already there
+    DynamicPath((nested + kHostSeparator).c_str()).MakeAllDirectoriesInPathNameLong();
+
+    Write("plain", "file");
+    std::string const blocked = At(std::string("plain") + kHostSeparator + "sub");
+    TEException e =
+        Caught([&] { DynamicPath(blocked.c_str()).MakeAllDirectoriesInPathNameLong(); });
+    EXPECT_NE(e.GetErrorCode(), TE_NO_ERROR);
+    EXPECT_STREQ(e.GetFunctionName(), "PathBase::MakeAllDirectoriesInPathNameLong");
+
+    // The third level cannot be made: the first two go again.
+    std::string const tooLong =
+        At(std::string("new1") + kHostSeparator + "new2" + kHostSeparator + std::string(300, 'x'));
+    e = Caught([&] { DynamicPath(tooLong.c_str()).MakeAllDirectoriesInPathNameLong(); });
+    EXPECT_NE(e.GetErrorCode(), TE_NO_ERROR);
+    EXPECT_FALSE(Has("new1"));
+}
+
+TEST_F(PathFiles, WildcardListingFillsTheOrderedSet) {
+    Write("a.txt", "");
+    Write("B.TXT", "");
+    Write("c.log", "");
+    fs::create_directory(At("d.txt"));
+    PathBase::PathSet files;
+    EXPECT_EQ(DynamicPath(At("*.txt").c_str()).FindFilesEx(files, false), 2);
+    ASSERT_EQ(files.size(), 2u);
+    EXPECT_EQ(std::string(files.begin()->CStr()), At("a.txt"));
+    EXPECT_EQ(std::string(files.rbegin()->CStr()), At("B.TXT"));
+
+    files.clear();
+    EXPECT_EQ(DynamicPath(At("*.TXT").c_str()).FindFilesEx(files, true), 3);
+    EXPECT_EQ(files.count(Path(At("d.txt").c_str())), 1u);
+    files.clear();
+    EXPECT_EQ(DynamicPath(At("?.*").c_str()).FindFilesEx(files, false), 3);
+    EXPECT_EQ(DynamicPath(At("*.*").c_str()).FindFilesEx(files, false), 3);
+    EXPECT_EQ(DynamicPath(At("*.none").c_str()).FindFilesEx(files, false), 0);
+    EXPECT_EQ(files.size(), 3u);
+
+    TEException const e = Caught([&] {
+        DynamicPath(At("nowhere" + std::string(1, kHostSeparator) + "*").c_str())
+            .FindFilesEx(files, false);
+    });
+#if defined(_WIN32)
+    EXPECT_EQ(e.GetErrorCode(), TE_PATH_NOT_FOUND);
+#else
+    EXPECT_EQ(e.GetErrorCode(), TE_FILE_NOT_FOUND);
+#endif
+}
+
+TEST_F(PathFiles, UniqueTemporaryFilesAreCreatedBesideTheTarget) {
+    DynamicPath target(At("settings.ini").c_str());
+    DynamicPath first, second;
+    target.CreateUniqueTempFile("ini$$", first);
+    target.CreateUniqueTempFile("ini$$", second);
+    EXPECT_TRUE(first.Exists());
+    EXPECT_TRUE(second.Exists());
+    EXPECT_NE(std::string(first.CStr()), std::string(second.CStr()));
+    std::string const name = fs::path(first.CStr()).filename().string();
+    EXPECT_EQ(name.size(), 5u + 6u + 4u) << name;
+    EXPECT_EQ(name.substr(0, 5), "ini$$");
+    EXPECT_EQ(name.substr(11), ".tmp");
+    EXPECT_EQ(fs::path(first.CStr()).parent_path(), m_root);
+    EXPECT_EQ(first.GetFileSize(), 0u);
+
+    DynamicPath inDirectory((m_rootText + kHostSeparator).c_str());
+    DynamicPath third;
+    inDirectory.CreateUniqueTempFile(nullptr, third);
+    EXPECT_EQ(fs::path(third.CStr()).parent_path(), m_root);
+
+    DynamicPath nowhere(At("missing" + std::string(1, kHostSeparator) + "x.ini").c_str());
+    EXPECT_NE(Caught([&] { nowhere.CreateUniqueTempFile("ini$$", third); }).GetErrorCode(),
+              TE_NO_ERROR);
+}
+
+TEST_F(PathFiles, SameFileUnderAnotherSpelling) {
+    Write("same.txt", "s");
+    DynamicPath const plain(At("same.txt").c_str());
+    std::string const dotted = m_rootText + kHostSeparator + "." + kHostSeparator + "same.txt";
+    EXPECT_FALSE(plain.ShortPathNameAwareEquals(dotted.c_str(), false));
+    EXPECT_TRUE(plain.ShortPathNameAwareEquals(dotted.c_str(), true));
+    EXPECT_TRUE(plain.ShortPathNameAwareEquals(DynamicPath(dotted.c_str()), true));
+    EXPECT_FALSE(plain.ShortPathNameAwareEquals(At("other.txt").c_str(), true));
+}
+
+TEST(PathProcess, CurrentDirectoryAndProgramFileExist) {
+    Path current;
+    ASSERT_TRUE(PathBase::GetCurrentDir(current));
+    EXPECT_FALSE(current.IsEmpty());
+    EXPECT_TRUE(current.Exists());
+    EXPECT_EQ(fs::path(current.CStr()), fs::current_path());
+
+    Path program("stale");
+    program.SetUsingGetModuleFileName(nullptr);
+    EXPECT_TRUE(program.Exists());
+    EXPECT_NE(std::string(program.CStr()).find("paths_tests"), std::string::npos) << program.CStr();
+}

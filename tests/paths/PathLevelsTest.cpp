@@ -1,0 +1,171 @@
+#include "PathTestSupport.h"
+#include "tekit/paths/Path.h"
+
+#include <string>
+
+using namespace tekit;
+using tekit::testing::TextOf;
+
+namespace {
+
+std::string Prefix(char const* text, long numLevels) {
+    Path out("unchanged");
+    bool const found = Path(text).GetPrefix(numLevels, out);
+    return (found ? "" : "false:") + std::string(out.CStr());
+}
+std::string PrefixBefore(char const* text, char const* suffix) {
+    Path out("unchanged");
+    Path end(suffix);
+    bool const found = Path(text).GetPrefix(end, out);
+    return (found ? "" : "false:") + std::string(out.CStr());
+}
+std::string SuffixAfter(char const* text, char const* prefix) {
+    Path out("unchanged");
+    bool const found = Path(text).GetSuffix(Path(prefix), out);
+    return (found ? "" : "false:") + std::string(out.CStr());
+}
+std::string Common(char const* a, char const* b) {
+    return PathBase::FindCommonPrefix(Path(a), Path(b)).CStr();
+}
+std::string UpTo(char const* text, long count) {
+    return TextOf([&](String& out) { Path(text).GetUpToCntPathNameComponents(count, out); });
+}
+
+} // namespace
+
+TEST(PathLevels, LevelsFollowTheRootAndATrailingSeparatorAddsNone) {
+    EXPECT_EQ(Path("").GetNumLevels(), 0);
+    EXPECT_EQ(Path("C:\\").GetNumLevels(), 0);
+    EXPECT_EQ(Path("C:\\a").GetNumLevels(), 1);
+    EXPECT_EQ(Path("C:\\a\\").GetNumLevels(), 1);
+    EXPECT_EQ(Path("C:\\a\\b.txt").GetNumLevels(), 2);
+    EXPECT_EQ(Path("C:\\a\\\\b").GetNumLevels(), 3); // an empty level between
+    EXPECT_EQ(Path("a\\b").GetNumLevels(), 2);
+    EXPECT_EQ(Path("\\a").GetNumLevels(), 1);
+    EXPECT_EQ(Path("\\\\srv\\share").GetNumLevels(), 0);
+    EXPECT_EQ(Path("\\\\srv\\share\\d\\").GetNumLevels(), 1);
+
+    EXPECT_EQ(Path("C:\\a\\b").GetNumPathNameComponents(), 3);
+    EXPECT_EQ(Path("C:\\").GetNumPathNameComponents(), 1);
+    EXPECT_EQ(Path("a\\b").GetNumPathNameComponents(), 2);
+    EXPECT_EQ(Path("\\\\srv\\share\\a").GetNumPathNameComponents(), 2);
+    EXPECT_EQ(Path("").GetNumPathNameComponents(), 0);
+}
+
+TEST(PathLevels, LeadingComponentsCountTheRootAsOne) {
+    EXPECT_EQ(UpTo("C:\\a\\b", 0), "");
+    EXPECT_EQ(UpTo("C:\\a\\b", -3), "");
+    EXPECT_EQ(UpTo("C:\\a\\b", 1), "C:\\");
+    EXPECT_EQ(UpTo("C:\\a\\b", 2), "C:\\a");
+    EXPECT_EQ(UpTo("C:\\a\\b\\", 9), "C:\\a\\b");
+    EXPECT_EQ(UpTo("a\\b\\c", 2), "a\\b");
+    EXPECT_EQ(UpTo("\\\\srv\\sh\\a\\b", 1), "\\\\srv\\sh");
+    EXPECT_EQ(UpTo("\\\\srv\\sh\\a\\b", 2), "\\\\srv\\sh\\a");
+}
+
+TEST(PathLevels, PrefixOfSomeLevels) {
+    EXPECT_EQ(Prefix("C:\\a\\b\\c", 0), "C:\\");
+    EXPECT_EQ(Prefix("C:\\a\\b\\c", 2), "C:\\a\\b");
+    EXPECT_EQ(Prefix("C:\\a\\b\\c", 3), "C:\\a\\b\\c");
+    EXPECT_EQ(Prefix("C:\\a\\b\\c", 4), "false:unchanged");
+    EXPECT_EQ(Prefix("C:\\a\\b\\c", -1), "false:unchanged");
+    EXPECT_EQ(Prefix("a\\b", 0), "");
+    EXPECT_EQ(Prefix("\\\\srv\\sh\\a", 0), "\\\\srv\\sh");
+}
+
+TEST(PathLevels, PrefixBeforeASuffixAndSuffixAfterAPrefix) {
+    EXPECT_EQ(PrefixBefore("C:\\a\\b\\c", "B\\c"), "C:\\a");
+    EXPECT_EQ(PrefixBefore("C:\\a\\b\\c", "a\\b\\c"), "C:\\");
+    EXPECT_EQ(PrefixBefore("C:\\a\\b\\c", "x\\c"), "false:unchanged");
+    EXPECT_EQ(PrefixBefore("C:\\a\\b\\c", "a\\b\\c\\d"), "false:unchanged");
+    EXPECT_EQ(PrefixBefore("C:\\a\\b\\c", "c:\\A\\b\\c"), ""); // rooted: whole path
+    EXPECT_EQ(PrefixBefore("C:\\a\\b\\c", "C:\\a"), "false:unchanged");
+
+    EXPECT_EQ(SuffixAfter("C:\\a\\b\\c", "c:\\A"), "b\\c");
+    EXPECT_EQ(SuffixAfter("C:\\a\\b\\c\\", "C:\\a\\"), "b\\c\\"); // the rest as written
+    EXPECT_EQ(SuffixAfter("C:\\a\\b", "C:\\a\\b"), "");
+    EXPECT_EQ(SuffixAfter("C:\\ab\\c", "C:\\a"), "false:unchanged"); // whole levels only
+    EXPECT_EQ(SuffixAfter("C:\\a\\b", "D:\\a"), "false:unchanged");
+    EXPECT_EQ(SuffixAfter("C:\\a\\b", "a"), "false:unchanged");
+    EXPECT_EQ(SuffixAfter("a\\b", "a"), "b");
+    EXPECT_EQ(SuffixAfter("\\\\srv\\sh\\a", "\\\\SRV\\sh"), "a");
+}
+
+TEST(PathLevels, PrefixAndSuffixOfAnAbsolutePath) {
+    Path const whole("C:\\a\\b\\c.txt");
+    EXPECT_TRUE(Path("C:\\a").IsPrefixOfAbsolutePath(whole, false));
+    EXPECT_TRUE(Path("c:\\A\\").IsPrefixOfAbsolutePath(whole, false));
+    EXPECT_TRUE(Path("C:\\").IsPrefixOfAbsolutePath(whole, false));
+    EXPECT_FALSE(whole.IsPrefixOfAbsolutePath(whole, false));
+    EXPECT_TRUE(whole.IsPrefixOfAbsolutePath(whole, true));
+    EXPECT_FALSE(Path("a").IsPrefixOfAbsolutePath(whole, true));
+    EXPECT_FALSE(Path("C:\\a\\b").IsPrefixOfAbsolutePath(Path("a\\b\\c"), true));
+    EXPECT_FALSE(Path("").IsPrefixOfAbsolutePath(whole, true));
+
+    EXPECT_TRUE(Path("b\\c.txt").IsSuffixOfAbsolutePath(whole));
+    EXPECT_TRUE(Path("C.TXT").IsSuffixOfAbsolutePath(whole));
+    EXPECT_FALSE(Path("a\\c.txt").IsSuffixOfAbsolutePath(whole));
+    EXPECT_FALSE(Path("x\\a\\b\\c.txt").IsSuffixOfAbsolutePath(whole));
+    EXPECT_TRUE(whole.IsSuffixOfAbsolutePath(whole));
+    EXPECT_FALSE(Path("C:\\b\\c.txt").IsSuffixOfAbsolutePath(whole));
+    EXPECT_FALSE(Path("").IsSuffixOfAbsolutePath(whole));
+    EXPECT_FALSE(Path("c").IsSuffixOfAbsolutePath(Path("a\\c")));
+}
+
+TEST(PathLevels, RootDirectoryIsADirectoryText) {
+    EXPECT_STREQ(Path("C:\\a\\b").GetRootDir().CStr(), "C:\\");
+    EXPECT_STREQ(Path("C:").GetRootDir().CStr(), "C:\\");
+    EXPECT_STREQ(Path("\\\\srv\\sh\\a").GetRootDir().CStr(), "\\\\srv\\sh\\");
+    EXPECT_STREQ(Path("\\\\srv\\sh").GetRootDir().CStr(), "\\\\srv\\sh\\");
+    EXPECT_STREQ(Path("\\a").GetRootDir().CStr(), "\\");
+    EXPECT_STREQ(Path("a\\b").GetRootDir().CStr(), "");
+}
+
+TEST(PathLevels, CommonPrefixIsMadeOfWholeLevels) {
+    EXPECT_EQ(Common("C:\\a\\b\\c", "c:\\A\\b\\d"), "C:\\a\\b");
+    EXPECT_EQ(Common("C:\\ab", "C:\\abc"), "C:\\");
+    EXPECT_EQ(Common("C:\\a\\b", "C:\\a\\b\\"), "C:\\a\\b");
+    EXPECT_EQ(Common("C:\\a", "D:\\a"), "");
+    EXPECT_EQ(Common("a\\b\\c", "a\\b"), "a\\b");
+    EXPECT_EQ(Common("a\\b", "C:\\a\\b"), "");
+    EXPECT_EQ(Common("\\\\srv\\sh\\x", "\\\\srv\\sh\\y"), "\\\\srv\\sh");
+    EXPECT_EQ(Common("\\\\srv\\sh\\x", "\\\\srv\\other\\x"), "");
+}
+
+TEST(PathLevels, DirectoryHoldsPathsAndLibraryEntries) {
+    Path const directory("C:\\d");
+    PathBase::VINamespaceInfo info;
+    info.isInLibrary = true;
+    info.entryName = "stale";
+    EXPECT_TRUE(directory.DirectoryContainsPath(Path("C:\\D\\f.txt"), &info));
+    EXPECT_FALSE(info.isInLibrary);
+    EXPECT_STREQ(info.entryName.GetBufferReadPtr(), "");
+    EXPECT_FALSE(directory.DirectoryContainsPath(Path("C:\\d\\s\\f.txt"), nullptr));
+    EXPECT_FALSE(directory.DirectoryContainsPath(Path("C:\\d"), nullptr));
+    EXPECT_FALSE(directory.DirectoryContainsPath(Path("C:\\dx\\f"), nullptr));
+    EXPECT_TRUE(Path("C:\\d\\").DirectoryContainsPath(Path("C:\\d\\f"), nullptr));
+
+    EXPECT_TRUE(directory.DirectoryContainsPath(Path("C:\\d\\tools.LWB\\Main.vi"), &info));
+    EXPECT_TRUE(info.isInLibrary);
+    EXPECT_STREQ(info.libraryPath.GetBufferReadPtr(), "C:\\d\\tools.LWB");
+    EXPECT_STREQ(info.entryName.GetBufferReadPtr(), "Main.vi");
+
+    EXPECT_TRUE(directory.SubDirectoryContainsPath(Path("C:\\d\\s\\t\\f.txt"), &info));
+    EXPECT_FALSE(info.isInLibrary);
+    EXPECT_TRUE(directory.SubDirectoryContainsPath(Path("C:\\d\\s\\x.lwb\\e"), &info));
+    EXPECT_TRUE(info.isInLibrary);
+    EXPECT_STREQ(info.libraryPath.GetBufferReadPtr(), "C:\\d\\s\\x.lwb");
+    EXPECT_FALSE(directory.SubDirectoryContainsPath(Path("D:\\d\\f"), &info));
+    EXPECT_FALSE(info.isInLibrary);
+    EXPECT_FALSE(Path("").SubDirectoryContainsPath(Path("a"), nullptr));
+}
+
+TEST(PathLevels, UncTextWithoutAShareHasNoLevels) {
+    Path const machineOnly("\\\\srv");
+    tekit::testing::Caught([&] { machineOnly.GetNumLevels(); });
+    tekit::testing::Caught([&] { machineOnly.GetRootDir(); });
+    tekit::testing::Caught([&] { machineOnly.IsRootDirectory(); });
+    EXPECT_STREQ(PathBase::FindCommonPrefix(Path("\\\\srv\\a\\b"), Path("\\\\srv\\a")).CStr(),
+                 "\\\\srv\\a");
+    EXPECT_FALSE(machineOnly.IsValid(false, nullptr)); // validation never raises
+}

@@ -1,0 +1,211 @@
+#include "PathTestSupport.h"
+#include "errors/DebugCapture.h"
+#include "strings/MultiByteFixture.h"
+#include "tekit/errors/RString.h"
+#include "tekit/paths/IsValidPath.h"
+#include "tekit/paths/Path.h"
+
+#include <string>
+
+using namespace tekit;
+using tekit::testing::Caught;
+using tekit::testing::RawPath;
+
+namespace {
+
+constexpr char kEmpty[] = "Path is empty.";
+constexpr char kSepAfterDrive[] = "Path separator (\\) must follow drive specification.";
+constexpr char kMissingNetworkName[] = "Path missing network name.";
+constexpr char kMissingDirectory[] = "Path missing directory name after the network name.";
+constexpr char kInvalidNetworkName[] = "Path contains invalid network name.";
+constexpr char kInvalidShare[] = "Path contains invalid directory name.";
+constexpr char kBeginsWithSeparator[] =
+    "Path begins with separator (\\).\n"
+    "Paths must begin with drive specification (C:) or network name (\\\\machine\\C).";
+constexpr char kEmptyComponent[] = "Path contains two adjacent path separators (\\\\).";
+constexpr char kInvalidChars[] =
+    "One or more path components contain invalid characters: (< > | : / \\ \" * ?).";
+
+/// "" when `path` is valid, otherwise IsValid's message.
+std::string Problem(PathBase const& path, bool allowWildcards = false) {
+    DynamicString message("unset", true);
+    bool const valid = path.IsValid(allowWildcards, &message);
+    EXPECT_EQ(valid, message == "unset") << path.CStr();
+    return valid ? "" : message.GetBufferReadPtr();
+}
+std::string Problem(char const* text, bool allowWildcards = false) {
+    return Problem(Path(text), allowWildcards);
+}
+
+class PathValidity : public ::testing::Test {
+protected:
+    void SetUp() override { RString::ResetStrings(); }
+};
+
+} // namespace
+
+TEST_F(PathValidity, EmptyPathComesFirst) {
+    EXPECT_EQ(Problem(""), kEmpty);
+    EXPECT_EQ(Problem(RawPath("")), kEmpty);
+    EXPECT_FALSE(Path().IsValid(true, nullptr));
+}
+
+TEST_F(PathValidity, DrivePathsNeedASeparatorAfterTheDriveAndAreValidUpToTheirRoot) {
+    EXPECT_EQ(Problem("C:"), "");
+    EXPECT_EQ(Problem("C:\\"), "");
+    // Construction turns C:x into C:\x, so only stored text can break the rule; it is checked
+    // before the components (the empty one here would fail later).
+    EXPECT_EQ(Problem(RawPath("C:x\\\\y")), kSepAfterDrive);
+    EXPECT_EQ(Problem(RawPath("C:")), "");
+    EXPECT_EQ(Problem("C:x"), "");
+    EXPECT_EQ(Problem("C:\\\\"), kEmptyComponent);
+    EXPECT_EQ(Problem("C:\\a\\\\b"), kEmptyComponent);
+    EXPECT_EQ(Problem("C:\\a\\"), "");
+    EXPECT_EQ(Problem("1:\\a"), kInvalidChars); // not a drive: a relative path with a colon
+}
+
+TEST_F(PathValidity, UncPathsAreCheckedMachineFirstThenShareThenComponents) {
+    EXPECT_EQ(Problem("\\\\"), kMissingNetworkName);
+    EXPECT_EQ(Problem("\\\\srv"), kMissingDirectory);
+    EXPECT_EQ(Problem("\\\\srv\\"), kMissingDirectory);
+    EXPECT_EQ(Problem("\\\\.\\"), kMissingDirectory); // before the machine name is looked at
+    EXPECT_EQ(Problem("\\\\.\\share"), kInvalidNetworkName);
+    EXPECT_EQ(Problem("\\\\..\\share"), kInvalidNetworkName);
+    EXPECT_EQ(Problem("\\\\s*v\\share"), kInvalidNetworkName);
+    EXPECT_EQ(Problem("\\\\srv\\..\\f"), kInvalidShare);
+    EXPECT_EQ(Problem("\\\\srv\\.\\f"), kInvalidShare);
+    EXPECT_EQ(Problem("\\\\srv\\sh?", true), kInvalidShare); // never wildcards in a share
+    EXPECT_EQ(Problem("\\\\srv\\\\f"), kEmptyComponent);
+    EXPECT_EQ(Problem("\\\\srv\\share"), "");
+    EXPECT_EQ(Problem("\\\\srv\\share\\"), "");
+    EXPECT_EQ(Problem("\\\\srv\\share\\d\\..\\f.txt"), ""); // dots are fine past the share
+    EXPECT_EQ(Problem("\\\\srv\\share\\a|b"), kInvalidChars);
+}
+
+TEST_F(PathValidity, RelativePathsMustNotBeginWithASeparator) {
+    EXPECT_EQ(Problem("\\dir\\f.txt"), kBeginsWithSeparator);
+    EXPECT_EQ(Problem("\\a<b"), kBeginsWithSeparator);
+    EXPECT_EQ(Problem("dir\\f.txt"), "");
+    EXPECT_EQ(Problem(".."), "");
+}
+
+TEST_F(PathValidity, ComponentsAreCheckedLeftToRight) {
+    EXPECT_EQ(Problem("C:\\a<\\\\b"), kInvalidChars);
+    EXPECT_EQ(Problem("C:\\a\\\\b<"), kEmptyComponent);
+    for (char const* bad : {"<", ">", "|", ":", "/", "\"", "\r", "\n", "*", "?"}) {
+        std::string const text = std::string("C:\\d\\a") + bad + "b\\f.txt";
+        EXPECT_EQ(Problem(text.c_str()), kInvalidChars) << text;
+    }
+    EXPECT_EQ(Problem("C:\\tab\there\\\x01\x7F\xE9"), ""); // other control and 8-bit bytes
+}
+
+TEST_F(PathValidity, WildcardsOnlyInTheLastComponentAndOnlyWhenAllowed) {
+    EXPECT_EQ(Problem("C:\\d\\*.txt", true), "");
+    EXPECT_EQ(Problem("C:\\d\\*.txt", false), kInvalidChars);
+    EXPECT_EQ(Problem("C:\\d\\f?.txt\\", true), kInvalidChars); // a separator follows it
+    EXPECT_EQ(Problem("C:\\*\\f.txt", true), kInvalidChars);
+    EXPECT_EQ(Problem("C:\\*\\f.txt", false), kInvalidChars);
+    EXPECT_EQ(Problem("C:\\d\\a:b", true), kInvalidChars);
+}
+
+TEST_F(PathValidity, LastComponentAfterALibraryFileMayHoldAnything) {
+    EXPECT_EQ(Problem("C:\\d\\lib.lwb\\Main: <a|b>*?.vi"), "");
+    EXPECT_EQ(Problem("C:\\d\\LIB.LwB\\x/y"), "");
+    EXPECT_EQ(Problem("C:\\d\\lib.lwb\\sub\\x/y"), kInvalidChars); // one level deeper
+    EXPECT_EQ(Problem("C:\\d\\lib.lwb\\x/y\\z"), kInvalidChars);   // not the last component
+    EXPECT_EQ(Problem("C:\\d\\lib.lwbx\\x/y"), kInvalidChars);
+    EXPECT_EQ(Problem("C:\\d\\lib.lwb\\\\x/y"), kEmptyComponent);
+    EXPECT_EQ(Problem(".lwb\\x/y"), ""); // the entry starts at index 5
+    EXPECT_EQ(Problem("lwb\\x/y"), kInvalidChars);
+}
+
+TEST_F(PathValidity, ComponentAndNetworkNameChecks) {
+    DynamicString text("a*b", true);
+    EXPECT_TRUE(PathBase::IsValidPathComponent(text, true));
+    EXPECT_FALSE(PathBase::IsValidPathComponent(text, false));
+    text = "..";
+    EXPECT_TRUE(PathBase::IsValidPathComponent(text, false));
+    EXPECT_FALSE(PathBase::IsValidNetworkName(text));
+    EXPECT_FALSE(PathBase::IsValidShareDirName(text));
+    text = "a\nb";
+    EXPECT_FALSE(PathBase::IsValidPathComponent(text, true));
+    text = "...";
+    EXPECT_TRUE(PathBase::IsValidNetworkName(text));
+    text = "sh?";
+    EXPECT_FALSE(PathBase::IsValidNetworkName(text));
+    text = "";
+    EXPECT_TRUE(PathBase::IsValidNetworkName(text));
+}
+
+TEST_F(PathValidity, RaisingValidatorsCarryTheInvalidPathCodeAndTheirTexts) {
+    Path const bad("C:\\a\\\\b");
+    TEException e = Caught([&] { bad.Validate(false); });
+    EXPECT_EQ(e.GetErrorCode(), TE_INVALID_PATHNAME);
+    EXPECT_EQ(e.GetErrorCode(), -17204);
+    EXPECT_STREQ(e.GetDescription(), kEmptyComponent);
+    EXPECT_STREQ(e.GetFunctionName(), "PathBase::Validate");
+    EXPECT_STREQ(e.GetFileName(), "Path");
+
+    e = Caught([&] { bad.ValidateEx(false); });
+    EXPECT_EQ(e.GetErrorCode(), TE_INVALID_PATHNAME);
+    EXPECT_EQ(std::string(e.GetDescription()),
+              std::string("Invalid path: 'C:\\a\\\\b'\n\n") + kEmptyComponent);
+
+    e = Caught([] { Path("dir\\f.txt").ValidateAbsolute(false); });
+    EXPECT_EQ(e.GetErrorCode(), TE_INVALID_PATHNAME);
+    EXPECT_STREQ(e.GetDescription(), "The path is not absolute: 'dir\\f.txt'");
+
+    e = Caught([] { Path("").ValidateAbsolute(false); }); // invalid before not absolute
+    EXPECT_EQ(std::string(e.GetDescription()), std::string("Invalid path: ''\n\n") + kEmpty);
+
+    EXPECT_NO_THROW(Path("C:\\d\\*.txt").ValidateAbsolute(true));
+    EXPECT_NO_THROW(Path("\\\\srv\\share\\f").ValidateAbsolute(false));
+    EXPECT_NO_THROW(Path("dir\\f").Validate(false));
+}
+
+TEST_F(PathValidity, PercentInAPathIsNotTakenForAPlaceholder) {
+    TEException const e = Caught([] { Path("C:\\100%1\\a\\\\b").ValidateEx(false); });
+    EXPECT_EQ(std::string(e.GetDescription()),
+              std::string("Invalid path: 'C:\\100%1\\a\\\\b'\n\n") + kEmptyComponent);
+}
+
+TEST_F(PathValidity, FlatEntryPointRefusesLongTextWithoutParsing) {
+    EXPECT_TRUE(IsValidPath("C:\\d\\f.txt", 0));
+    EXPECT_FALSE(IsValidPath("C:\\d\\*.txt", 0));
+    EXPECT_TRUE(IsValidPath("C:\\d\\*.txt", 7));
+    EXPECT_TRUE(IsValidPath("C:x", 0)); // normalised to C:\x as a Path
+    EXPECT_FALSE(IsValidPath(nullptr, 0));
+    EXPECT_FALSE(IsValidPath("", 1));
+
+    std::string text = "C:\\" + std::string(256, 'a');
+    ASSERT_EQ(text.size(), 259u);
+    EXPECT_TRUE(IsValidPath(text.c_str(), 0));
+    text += 'a';
+    EXPECT_FALSE(IsValidPath(text.c_str(), 0)); // 260 bytes: a Path could hold it, still no
+    EXPECT_TRUE(Path(text.c_str()).IsValid(false, nullptr));
+}
+
+class PathValidityMultiByte : public tekit::testing::MultiByteFixture {};
+
+TEST_F(PathValidityMultiByte, TrailByteThatEqualsABackslashIsNoSeparator) {
+    // 0x95 0x5C is one Shift-JIS character whose trail byte is the backslash's value.
+    char const* const text = "C:\\a\x95\x5C\\b";
+    EXPECT_EQ(Problem(text), kEmptyComponent); // single-byte: a\x95, "", b
+    UseShiftJis();
+    EXPECT_EQ(Problem(text), "");
+    EXPECT_EQ(Problem("C:\\\x95\x5C<"), kInvalidChars);
+}
+
+TEST(PathAssertions, InternalErrorsRaiseTheProgramErrorWithTheirTextWhenDiagnosing) {
+    tekit::testing::DiagnosticLevelScope const diagnosing(1);
+    TEException e = Caught([] { Path("\\\\srv").GetNumLevels(); });
+    EXPECT_EQ(e.GetErrorCode(), TE_PROGRAM_ERROR);
+    EXPECT_EQ(e.GetErrorCode(), -17001);
+    EXPECT_STREQ(e.GetDescription(), "invalid UNC path");
+    DynamicString extension;
+    e = Caught([&] { PathBase::GetCmdFileExtension(4, extension); });
+    EXPECT_EQ(e.GetErrorCode(), TE_PROGRAM_ERROR);
+    EXPECT_STREQ(e.GetDescription(), "invalid index to GetCmdFileExtension");
+    e = Caught([&] { PathBase::GetCmdFileExtension(-1, extension); });
+    EXPECT_EQ(e.GetErrorCode(), TE_PROGRAM_ERROR);
+}
