@@ -8,6 +8,7 @@
 #include "strings/MultiByte.h"
 #include "strings/TextEdit.h"
 #include "strings/TextSearch.h"
+#include "tekit/errors/RString.h"
 #include "tekit/errors/Raise.h"
 #include "tekit/strings/String.h"
 
@@ -252,7 +253,8 @@ void String::AppendUsingSeparator(String const& item, char const* separator) {
 // ---- Formatting fallback -----------------------------------------------------------------
 
 void String::HandleMissingFormatArgument(String const& placeholder, String const& argument) {
-    TE_WARN("Could not find argument to replace in string", "String::HandleMissingFormatArgument");
+    TE_WARN(RString("ERR_DESCR", "FORMAT_ARGUMENT_NOT_FOUND", nullptr, nullptr),
+            "String::HandleMissingFormatArgument");
     std::string tail(" COULD NOT FIND ");
     tail.append(search::ReadPtr(placeholder), size_t(placeholder.GetNumBytes()));
     tail += "TO REPLACE WITH ";
