@@ -34,8 +34,7 @@ template <class Cut> void Insert(char* dest, char const* text, int offset, int d
     int const keepText = cut(insert.c_str(), room);
     // When the text itself is cut, none of the old tail follows it: the result stays a prefix of
     // the uncut result.
-    int const keepTail =
-        keepText < int(insert.size()) ? 0 : cut(dest + offset, room - keepText);
+    int const keepTail = keepText < int(insert.size()) ? 0 : cut(dest + offset, room - keepText);
     std::memmove(dest + offset + keepText, dest + offset, size_t(keepTail));
     std::memcpy(dest + offset, insert.data(), size_t(keepText));
     dest[offset + keepText + keepTail] = '\0';

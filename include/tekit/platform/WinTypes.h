@@ -13,9 +13,12 @@
 #ifndef NOMINMAX
 #define NOMINMAX
 #endif
+// <windows.h> must come first: the OLE headers depend on it.
+// clang-format off
 #include <windows.h>
 #include <oaidl.h>
 #include <comdef.h> // _bstr_t, with the _com_error it raises on failure
+// clang-format on
 #else
 using HANDLE = void*;
 /// A module: on POSIX any address inside the shared object (null: the program).
