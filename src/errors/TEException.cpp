@@ -2,7 +2,6 @@
 
 #include "errors/Warning.h"
 #include "tekit/errors/DebugOutput.h"
-#include "tekit/paths/Path.h"
 
 #include <exception>
 #include <ostream>
@@ -129,17 +128,11 @@ void TEException::SetWinHelpID(unsigned long helpID) {
 unsigned long TEException::GetWinHelpID() const {
     return m_winHelpID;
 }
-void TEException::SetWinHelpFile(Path const& helpFile) {
-    m_winHelpFile = helpFile.GetString();
-}
 void TEException::SetWinHelpFile(String const& helpFile) {
     m_winHelpFile = helpFile;
 }
 char const* TEException::GetWinHelpFile() const {
     return m_winHelpFile.GetBufferReadPtr();
-}
-void TEException::GetWinHelpFile(Path& helpFile) const {
-    helpFile.SetPathName(m_winHelpFile);
 }
 void TEException::GetWinHelpFile(String& helpFile) const {
     helpFile.Assign(m_winHelpFile);
