@@ -1,15 +1,21 @@
 #include "errors/MessageCatalogue.h"
 
+#include "tekit/errors/StatusDefinitions.h"
+
 namespace tekit::detail {
 
 namespace {
 
-// One table file per section, each a list of {"KEY", "text"} rows.
+// One table file per section, each a list of {"KEY", "text"} rows; "TE_ERRORS" comes from the
+// error definitions.
 constexpr MessageRow kErrors[] = {
 #include "catalogue/ERRORS.inc"
 };
+/// "TE_ERRORS": each TEError's message under its symbol, then the text of codes not listed.
 constexpr MessageRow kTEErrors[] = {
-#include "catalogue/TE_ERRORS.inc"
+#define TE_ERROR(symbol, value, comCode, text) TEKIT_STATUS_MESSAGE(#symbol, text)
+#include "tekit/errors/TEError.def"
+    {"USER_DEFINED_ERR_CODE", "User-defined error code."},
 };
 constexpr MessageRow kErrDescr[] = {
 #include "catalogue/ERR_DESCR.inc"
