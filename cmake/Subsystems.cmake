@@ -22,6 +22,10 @@ target_compile_features(tekit_internal INTERFACE cxx_std_20)
 function(tekit_add_subsystem name)
   cmake_parse_arguments(arg "" "" "SOURCES;DEPENDS;LIBRARIES" ${ARGN})
   set(target tekit_${name})
+  set_property(GLOBAL APPEND PROPERTY TEKIT_SUBSYSTEMS ${name})
+  if(NOT arg_SOURCES)
+    return() # a subsystem whose sources are not written yet
+  endif()
   add_library(${target} OBJECT ${arg_SOURCES})
   set_target_properties(${target} PROPERTIES
     POSITION_INDEPENDENT_CODE ON
@@ -41,5 +45,4 @@ function(tekit_add_subsystem name)
   # System libraries reach whoever links the objects: the shared library and the tests.
   target_link_libraries(tekit PRIVATE ${target} ${arg_LIBRARIES})
   target_link_libraries(tekit_internal PUBLIC ${target} ${arg_LIBRARIES})
-  set_property(GLOBAL APPEND PROPERTY TEKIT_SUBSYSTEMS ${name})
 endfunction()

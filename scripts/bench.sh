@@ -1,13 +1,29 @@
 #!/usr/bin/env bash
-# Builds the benchmarks optimised (release preset) and runs them; the strings benchmark ends
-# with each figure as a ratio of std::string's. Arguments go to the benchmark program:
+# Builds the benchmarks optimised (release preset) and runs them. Each program ends with its
+# figures as ratios of its peer's in the same run. A first argument that does not start with
+# "-" picks the programs whose name contains it; the other arguments go to every program:
 #
-#   scripts/bench.sh
-#   scripts/bench.sh --benchmark_filter=Copy --benchmark_repetitions=5
+#   scripts/bench.sh                                  # every benchmark program
+#   scripts/bench.sh strings --benchmark_filter=Copy  # bench_strings only
+#   scripts/bench.sh --benchmark_repetitions=5
 set -euo pipefail
 cd "$(dirname "$0")/.."
 
-scripts/install-deps.sh --linux
+filter=
+if [[ $# -gt 0 && "$1" != -* ]]; then
+    filter=$1
+    shift
+fi
+
+scripts/install-deps.sh --linux >&2
 cmake --preset release >/dev/null
-cmake --build --preset release --parallel "$(nproc)" --target bench_strings
-exec build/release/bench/strings/bench_strings "$@"
+cmake --build --preset release --parallel "$(nproc)" >&2
+
+status=0
+for program in $(find build/release/bench -type f -name 'bench_*' -perm -u+x | sort); do
+    name=$(basename "$program")
+    [[ -n "$filter" && "$name" != *"$filter"* ]] && continue
+    echo "==== $name"
+    "$program" "$@" || status=1
+done
+exit $status
