@@ -3,6 +3,8 @@
 #   tekit_add_subsystem(strings
 #     SOURCES   CopyOnWrite.cpp DynamicString.cpp ...        # explicit: no globbing
 #     DEPENDS   platform errors                              # subsystems it builds on
+#     WIN32_SOURCES StringVector_win32.cpp ...                # COM and Win32-only parts
+#     POSIX_SOURCES ...                                       # their stand-ins elsewhere
 #     LIBRARIES ${CMAKE_DL_LIBS})                            # system libraries it needs
 #
 # Each subsystem is an OBJECT library `tekit_<name>`: its objects go into the shared library
@@ -20,7 +22,12 @@ target_include_directories(tekit_internal INTERFACE ${PROJECT_SOURCE_DIR}/includ
 target_compile_features(tekit_internal INTERFACE cxx_std_20)
 
 function(tekit_add_subsystem name)
-  cmake_parse_arguments(arg "" "" "SOURCES;DEPENDS;LIBRARIES" ${ARGN})
+  cmake_parse_arguments(arg "" "" "SOURCES;WIN32_SOURCES;POSIX_SOURCES;DEPENDS;LIBRARIES" ${ARGN})
+  if(WIN32)
+    list(APPEND arg_SOURCES ${arg_WIN32_SOURCES})
+  else()
+    list(APPEND arg_SOURCES ${arg_POSIX_SOURCES})
+  endif()
   set(target tekit_${name})
   set_property(GLOBAL APPEND PROPERTY TEKIT_SUBSYSTEMS ${name})
   if(NOT arg_SOURCES)

@@ -42,14 +42,4 @@ DynamicString AddLookupStrings(String const& parent, String const& child) {
     return lookup;
 }
 
-#if TEKIT_HAS_OLE
-_bstr_t AddLookupStrings(_bstr_t const& parent, _bstr_t const& child) {
-    if (parent.length() == 0)
-        return child;
-    if (child.length() == 0)
-        return parent;
-    return parent + _bstr_t(L".") + child;
-}
-#endif
-
 } // namespace tekit

@@ -259,12 +259,4 @@ DynamicString operator+(RString const& a, wchar_t const* b) {
     return result;
 }
 
-#if TEKIT_HAS_OLE
-DynamicString operator+(RString const& a, _bstr_t const& b) {
-    DynamicString result(a.GetString());
-    result += b;
-    return result;
-}
-#endif
-
 } // namespace tekit

@@ -40,9 +40,18 @@ std::vector<PathChars> Shortenings(PathChars const& chars, PathShape const& shap
     return forms;
 }
 
+PathChars FileNameOf(PathChars const& chars) {
+    int start = 0, length = 0;
+    if (!FindFileName(chars, start, length))
+        return {};
+    return PathChars(chars.begin() + start, chars.end());
+}
+
+} // namespace
+
 /// The first shortening that `fits`, or the last level when none does.
-PathChars Shorten(PathChars const& chars, int top, int headEnd,
-                  std::function<bool(PathChars const&)> const& fits) {
+PathChars detail::Shorten(PathChars const& chars, int top, int headEnd,
+                          std::function<bool(PathChars const&)> const& fits) {
     PathShape const shape = ShapeOf(chars, "PathBase::GetAbbreviatedName");
     if (shape.levels.empty())
         TE_PATH_ASSERTION("Missing path components??", "PathBase::GetAbbreviatedName");
@@ -52,15 +61,6 @@ PathChars Shorten(PathChars const& chars, int top, int headEnd,
             return form;
     return forms.back();
 }
-
-PathChars FileNameOf(PathChars const& chars) {
-    int start = 0, length = 0;
-    if (!FindFileName(chars, start, length))
-        return {};
-    return PathChars(chars.begin() + start, chars.end());
-}
-
-} // namespace
 
 void PathBase::GetAbbreviatedName(int maxChars, String& out) const {
     PathChars const chars = ToChars(GetPathString());
@@ -79,29 +79,6 @@ void PathBase::GetAbbreviatedName(int maxChars, String& out) const {
     else
         AssignChars(out, FileNameOf(chars));
 }
-
-#if defined(_WIN32)
-void PathBase::GetAbbreviatedNameToFit(long pixelWidth, String& out, HFONT font,
-                                       bool cutFileName) const {
-    auto const fits = [pixelWidth, font](PathChars const& form) {
-        long const width = platform::MeasureTextWidth(ToBytes(form).c_str(), font);
-        return width >= 0 && width <= pixelWidth;
-    };
-    PathChars const chars = ToChars(GetPathString());
-    if (chars.empty() || fits(chars)) {
-        out.Assign(GetPathString());
-        return;
-    }
-    int const top = GetTopLevel();
-    PathChars result = Shorten(chars, top, HeadEnd(top), fits);
-    // The last level alone is too wide as well: cut it from its end, marking the cut.
-    while (cutFileName && !fits(result) && result.size() > 3) {
-        result.resize(result.size() - 4);
-        result.insert(result.end(), 3, '.');
-    }
-    AssignChars(out, result);
-}
-#endif
 
 int PathBase::HeadEnd(int top) const {
     int firstLevel = 0;

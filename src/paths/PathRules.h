@@ -8,6 +8,7 @@
 #include "paths/PathChars.h"
 #include "tekit/errors/Raise.h"
 
+#include <functional>
 #include <vector>
 
 namespace tekit::detail {
@@ -51,6 +52,12 @@ bool FindTopLevel(PathChars const& chars, int& top);
 /// The shape of the text; a UNC text with no separator after the machine name raises
 /// TE_PROGRAM_ERROR ("invalid UNC path") naming `function`.
 PathShape ShapeOf(PathChars const& chars, char const* function);
+
+/// The first shortened form of `chars` that `fits`, or its last level when none does: the head
+/// (root and first level, ending at `headEnd`) kept while middle levels are dropped, then the
+/// root alone before the last level, then the last level alone.
+PathChars Shorten(PathChars const& chars, int top, int headEnd,
+                  std::function<bool(PathChars const&)> const& fits);
 /// The root and the first `numLevels` levels, without a trailing separator except a root's.
 PathChars PrefixOf(PathChars const& chars, PathShape const& shape, int numLevels);
 /// The root without a trailing separator except a root's ("X:\", "\"): for comparing roots.

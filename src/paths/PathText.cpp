@@ -2,11 +2,7 @@
 #include "tekit/paths/PathBase.h"
 
 #include "paths/PathRules.h"
-#include "platform/Platform.h"
 #include "tekit/errors/Raise.h"
-#include "tekit/strings/MultiByte.h"
-
-#include <new>
 
 namespace tekit {
 
@@ -101,29 +97,6 @@ void PathBase::ConvertForLongPathCalls(String const& path, String& converted) {
     }
     converted.Assign(result);
 }
-
-#if TEKIT_HAS_OLE
-_bstr_t PathBase::ConvertForLongPathCalls(String const& path) {
-    DynamicString narrow;
-    ConvertForLongPathCalls(path, narrow);
-    BSTR const text = narrow.AllocSysString();
-    if (!text)
-        TE_RAISE(TE_OUT_OF_MEMORY, nullptr, "PathBase::ConvertForLongPathCalls");
-    return _bstr_t(text, false);
-}
-#else
-std::wstring PathBase::ConvertForLongPathCalls(String const& path) {
-    DynamicString narrow;
-    ConvertForLongPathCalls(path, narrow);
-    try {
-        return platform::NarrowToWide(narrow.GetBufferReadPtr(), narrow.GetNumBytes(),
-                                      String::IsMultiByteSupportEnabled() ? GetMultiByteCodePage()
-                                                                          : 0);
-    } catch (std::bad_alloc const&) {
-        TE_RAISE(TE_OUT_OF_MEMORY, nullptr, "PathBase::ConvertForLongPathCalls");
-    }
-}
-#endif
 
 // ---- Classification -----------------------------------------------------------------------
 

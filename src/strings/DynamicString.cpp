@@ -48,12 +48,6 @@ DynamicString::DynamicString(DynamicString&& other) noexcept
         m_memory = SharedEmpty();
 }
 
-#if TEKIT_HAS_OLE
-DynamicString::DynamicString(_bstr_t const& text) : m_memory(SharedEmpty()) {
-    String::Assign(static_cast<wchar_t const*>(text));
-}
-#endif
-
 DynamicString::DynamicString(wchar_t const* text) : m_memory(SharedEmpty()) {
     String::Assign(text);
 }

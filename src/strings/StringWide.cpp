@@ -45,24 +45,4 @@ void String::AssignFromUTF8(char const* utf8, int numBytes) {
     AssignUsingNumBytesInsteadOfNumChars(narrow.c_str(), static_cast<int>(narrow.size()), false);
 }
 
-#if TEKIT_HAS_OLE
-String& String::operator+=(_bstr_t const& text) {
-    return *this += static_cast<wchar_t const*>(text);
-}
-
-void String::Assign(_bstr_t const& text) {
-    Assign(static_cast<wchar_t const*>(text));
-}
-
-BSTR String::AllocSysString() const {
-    std::wstring const text = wide::ToWide(GetBufferReadPtr(), GetNumBytes());
-    return ::SysAllocStringLen(text.data(), static_cast<UINT>(text.size()));
-}
-
-String::operator _bstr_t() const {
-    std::wstring const text = wide::ToWide(GetBufferReadPtr(), GetNumBytes());
-    return _bstr_t(text.c_str());
-}
-#endif
-
 } // namespace tekit

@@ -13,12 +13,16 @@
 #ifndef NOMINMAX
 #define NOMINMAX
 #endif
-// <windows.h> must come first: the OLE headers depend on it.
-// clang-format off
 #include <windows.h>
-#include <oaidl.h>
-#include <comdef.h> // _bstr_t, with the _com_error it raises on failure
-// clang-format on
+
+// The OLE Automation types that signatures name, declared only: code that calls one of those
+// overloads includes <comdef.h> (or <oleauto.h>) itself, as the library's COM sources do.
+class _bstr_t;
+struct tagVARIANT;
+typedef tagVARIANT VARIANT;
+struct tagSAFEARRAY;
+typedef tagSAFEARRAY SAFEARRAY;
+typedef wchar_t* BSTR;
 #else
 using HANDLE = void*;
 /// A module: on POSIX any address inside the shared object (null: the program).
