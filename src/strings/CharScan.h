@@ -6,8 +6,8 @@
 // multibyte mode off one byte is one character whatever the lead-byte table says.
 //
 //   bool mb = String::IsMultiByteSupportEnabled();
-//   for (char const* p = text; *p; p += scan::CharBytes(p, mb))
-//       if (scan::IsSingle(p, mb, '\\')) ...
+//   for (char const* p = text; *p; p += detail::CharBytes(p, mb))
+//       if (detail::IsSingle(p, mb, '\\')) ...
 #pragma once
 
 #include "strings/MultiByte.h"
@@ -15,7 +15,7 @@
 
 #include <string>
 
-namespace tekit::scan {
+namespace tekit::detail {
 
 /// Bytes of the character at `p`: 0 at the terminator, 2 for a double-byte character.
 inline int CharBytes(char const* p, bool mb) {
@@ -123,4 +123,4 @@ inline bool Rewriter::StoreInto(String& target) const {
     return m_changed;
 }
 
-} // namespace tekit::scan
+} // namespace tekit::detail

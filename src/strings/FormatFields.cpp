@@ -13,7 +13,7 @@
 #include <cwchar>
 #include <string_view>
 
-namespace tekit::formatting {
+namespace tekit::detail {
 
 namespace {
 
@@ -612,4 +612,4 @@ void AppendDecimal(std::string& out, std::uint64_t value) {
     out.append(digits, std::to_chars(digits, digits + sizeof digits, value).ptr);
 }
 
-} // namespace tekit::formatting
+} // namespace tekit::detail

@@ -2,7 +2,7 @@
 // every platform and in every locale, and no field reads an argument that is not there.
 //
 //   std::string out;
-//   formatting::FormatOne(out, "%08.3f", formatting::Value::Float(3.14159), ',');  // 0003,142
+//   detail::FormatOne(out, "%08.3f", detail::Value::Float(3.14159), ',');  // 0003,142
 //
 // Integers are written with std::to_chars, floating-point numbers with std::to_chars and the
 // printf precision rules, so "%.2f" gives exactly what the C runtime gives in the "C" locale.
@@ -14,7 +14,7 @@
 #include <cstdint>
 #include <string>
 
-namespace tekit::formatting {
+namespace tekit::detail {
 
 using Field = FormatStringAnalysis::Field;
 using Kind = FormatStringAnalysis::ArgumentKind;
@@ -63,4 +63,4 @@ void AppendPointer(std::string& out, std::uintptr_t value);
 void AppendDecimal(std::string& out, std::int64_t value);
 void AppendDecimal(std::string& out, std::uint64_t value);
 
-} // namespace tekit::formatting
+} // namespace tekit::detail

@@ -38,7 +38,7 @@ void AppendFlags(std::string& out, unsigned flags) {
 /// must not read that value.
 std::string FitField(FormatStringAnalysis::Field const& field, std::string_view original, long kind,
                      bool& valueTaken) {
-    char const conversion = valueTaken ? 0 : formatting::FitConversion(field.conversion, kind);
+    char const conversion = valueTaken ? 0 : detail::FitConversion(field.conversion, kind);
     std::string out = "%";
     if (conversion == 0)
         return out.append(original);
@@ -48,7 +48,7 @@ std::string FitField(FormatStringAnalysis::Field const& field, std::string_view 
         out += std::to_string(field.width);
     if (field.precision >= 0)
         out.append(1, '.').append(std::to_string(field.precision));
-    out += formatting::LengthTextFor(kind, conversion);
+    out += detail::LengthTextFor(kind, conversion);
     out += conversion;
     return out;
 }
@@ -76,7 +76,7 @@ void FormatStringAnalysis::Analyze(char const* format) {
             continue;
         }
         Field field;
-        int const numBytes = formatting::ParseField(p, field);
+        int const numBytes = detail::ParseField(p, field);
         field.offset = int(p - start);
         if (field.conversion != '%')
             m_fields.push_back(field);

@@ -141,13 +141,13 @@ String& String::operator+=(char const* text) {
 }
 
 String& String::operator+=(wchar_t const* text) {
-    std::string const narrow = wide::ToNarrow(text, -1);
+    std::string const narrow = detail::ToNarrow(text, -1);
     AppendBytes(narrow.c_str(), int(narrow.size()));
     return *this;
 }
 
 void String::Assign(wchar_t const* text) {
-    std::string const narrow = wide::ToNarrow(text, -1);
+    std::string const narrow = detail::ToNarrow(text, -1);
     AssignUsingNumBytesInsteadOfNumChars(narrow.c_str(), int(narrow.size()), false);
 }
 

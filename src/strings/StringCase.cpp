@@ -33,15 +33,15 @@ struct CaseRange {
 };
 
 CaseRange FindCaseRange(String const& s, int start, int numChars, bool upper, bool mb) {
-    char const* text = search::ReadPtr(s);
+    char const* text = detail::ReadPtr(s);
     int const numBytes = s.GetNumBytes();
-    int first = search::OffsetOfChar(text, numBytes, start, mb);
+    int first = detail::OffsetOfChar(text, numBytes, start, mb);
     int end = numBytes;
     if (numChars >= 0)
         end = first +
               (mb ? mbcs::NBCnt(text + first, numChars) : std::min(numChars, numBytes - first));
-    for (; first < end && !ChangesCase(scan::CharAt(text + first, mb), upper); --numChars)
-        first += scan::CharBytes(text + first, mb);
+    for (; first < end && !ChangesCase(detail::CharAt(text + first, mb), upper); --numChars)
+        first += detail::CharBytes(text + first, mb);
     return {first, end, numChars};
 }
 
@@ -96,7 +96,7 @@ void String::SetLowercase(int start, int numChars) {
 void String::Reverse() {
     bool const mb = m_isMultiByteSupportEnabled;
     int const numBytes = GetNumBytes();
-    if (numBytes < 2 || (mb && mbcs::CharBytes(search::ReadPtr(*this)) == numBytes))
+    if (numBytes < 2 || (mb && mbcs::CharBytes(detail::ReadPtr(*this)) == numBytes))
         return;
     char* p = GetBufferWritePtr();
     for (int i = 0; mb && i < numBytes;) {

@@ -39,9 +39,9 @@ int BytesOfChars(char const* text, int textBytes, int offset, int numChars, bool
 
 void String::GetSubstring(int start, int numChars, String& out) const {
     bool const mb = m_isMultiByteSupportEnabled;
-    char const* text = search::ReadPtr(*this);
+    char const* text = detail::ReadPtr(*this);
     int const numBytes = GetNumBytes();
-    int const offset = search::OffsetOfChar(text, numBytes, start, mb);
+    int const offset = detail::OffsetOfChar(text, numBytes, start, mb);
     int const bytes = BytesOfChars(text, numBytes, offset, numChars, mb);
     if (&out == this && offset == 0 && bytes == numBytes)
         return;
@@ -50,30 +50,30 @@ void String::GetSubstring(int start, int numChars, String& out) const {
 }
 
 void String::InsertSubstring(char const* text, int charIndex) {
-    edit::StableText const insert(*this, text, -1);
+    detail::StableText const insert(*this, text, -1);
     if (insert.size() == 0)
         return;
     int const numBytes = GetNumBytes();
-    int const offset = search::OffsetOfChar(search::ReadPtr(*this), numBytes, charIndex,
+    int const offset = detail::OffsetOfChar(detail::ReadPtr(*this), numBytes, charIndex,
                                             m_isMultiByteSupportEnabled);
-    SetCachedSize(edit::InsertBytes(*this, numBytes, offset, insert.data(), insert.size()));
+    SetCachedSize(detail::InsertBytes(*this, numBytes, offset, insert.data(), insert.size()));
 }
 
 void String::InsertSubstring(String const& text, int charIndex) {
-    edit::StableText const insert(*this, search::ReadPtr(text), text.GetNumBytes());
+    detail::StableText const insert(*this, detail::ReadPtr(text), text.GetNumBytes());
     if (insert.size() == 0)
         return;
     int const numBytes = GetNumBytes();
-    int const offset = search::OffsetOfChar(search::ReadPtr(*this), numBytes, charIndex,
+    int const offset = detail::OffsetOfChar(detail::ReadPtr(*this), numBytes, charIndex,
                                             m_isMultiByteSupportEnabled);
-    SetCachedSize(edit::InsertBytes(*this, numBytes, offset, insert.data(), insert.size()));
+    SetCachedSize(detail::InsertBytes(*this, numBytes, offset, insert.data(), insert.size()));
 }
 
 void String::RemoveSubstring(int start, int numChars) {
     bool const mb = m_isMultiByteSupportEnabled;
-    char const* text = search::ReadPtr(*this);
+    char const* text = detail::ReadPtr(*this);
     int const numBytes = GetNumBytes();
-    int const offset = search::OffsetOfChar(text, numBytes, start, mb);
+    int const offset = detail::OffsetOfChar(text, numBytes, start, mb);
     int const bytes = BytesOfChars(text, numBytes, offset, numChars, mb);
     if (bytes == 0)
         return;
@@ -81,22 +81,23 @@ void String::RemoveSubstring(int start, int numChars) {
         Clear(); // a shared block is released rather than copied
         return;
     }
-    SetCachedSize(edit::RemoveBytes(*this, numBytes, offset, bytes));
+    SetCachedSize(detail::RemoveBytes(*this, numBytes, offset, bytes));
 }
 
 void String::ReplaceSubstring(int start, int numChars, char const* replacement) {
     bool const mb = m_isMultiByteSupportEnabled;
-    edit::StableText const insert(*this, replacement, -1);
-    char const* text = search::ReadPtr(*this);
+    detail::StableText const insert(*this, replacement, -1);
+    char const* text = detail::ReadPtr(*this);
     int const numBytes = GetNumBytes();
-    int const offset = search::OffsetOfChar(text, numBytes, start, mb);
+    int const offset = detail::OffsetOfChar(text, numBytes, start, mb);
     int const bytes = BytesOfChars(text, numBytes, offset, numChars, mb);
-    edit::Splice(*this, numBytes, offset, bytes, insert, [this](int size) { SetCachedSize(size); });
+    detail::Splice(*this, numBytes, offset, bytes, insert,
+                   [this](int size) { SetCachedSize(size); });
 }
 
 bool String::ReplaceSubstring(String const& find, String const& replacement, bool ignoreCase,
                               bool wholeWordOnly) {
-    return ReplaceSubstring(search::ReadPtr(find), search::ReadPtr(replacement), ignoreCase,
+    return ReplaceSubstring(detail::ReadPtr(find), detail::ReadPtr(replacement), ignoreCase,
                             wholeWordOnly);
 }
 
@@ -104,13 +105,13 @@ bool String::ReplaceSubstring(char const* find, char const* replacement, bool ig
                               bool wholeWordOnly) {
     bool const mb = m_isMultiByteSupportEnabled;
     int const numBytes = GetNumBytes();
-    search::Needle const needle{find, Length(find), ignoreCase, wholeWordOnly};
-    int const at = search::FindNext(search::ReadPtr(*this), numBytes, 0, needle, mb);
+    detail::Needle const needle{find, Length(find), ignoreCase, wholeWordOnly};
+    int const at = detail::FindNext(detail::ReadPtr(*this), numBytes, 0, needle, mb);
     if (at < 0)
         return false;
-    edit::StableText const insert(*this, replacement, -1);
-    edit::Splice(*this, numBytes, at, needle.bytes, insert,
-                 [this](int size) { SetCachedSize(size); });
+    detail::StableText const insert(*this, replacement, -1);
+    detail::Splice(*this, numBytes, at, needle.bytes, insert,
+                   [this](int size) { SetCachedSize(size); });
     return true;
 }
 
@@ -119,10 +120,10 @@ bool String::ReplaceSubstring(char const* find, char const* replacement, bool ig
 int String::ReplaceAllSubstrings(char const* find, char const* replacement, bool ignoreCase,
                                  bool wholeWordOnly) {
     bool const mb = m_isMultiByteSupportEnabled;
-    char const* text = search::ReadPtr(*this);
+    char const* text = detail::ReadPtr(*this);
     int const numBytes = GetNumBytes();
-    search::Needle const needle{find, Length(find), ignoreCase, wholeWordOnly};
-    int at = search::FindNext(text, numBytes, 0, needle, mb);
+    detail::Needle const needle{find, Length(find), ignoreCase, wholeWordOnly};
+    int at = detail::FindNext(text, numBytes, 0, needle, mb);
     if (at < 0)
         return 0;
     std::string const insert(replacement ? replacement : "");
@@ -130,7 +131,7 @@ int String::ReplaceAllSubstrings(char const* find, char const* replacement, bool
     result.reserve(size_t(numBytes));
     int count = 0;
     int copied = 0;
-    for (; at >= 0; at = search::FindNext(text, numBytes, copied, needle, mb)) {
+    for (; at >= 0; at = detail::FindNext(text, numBytes, copied, needle, mb)) {
         result.append(text + copied, size_t(at - copied));
         result += insert;
         copied = at + needle.bytes;
@@ -147,29 +148,29 @@ int String::ReplaceAllSubstrings(char const* find, char const* replacement, bool
 bool String::ReplaceIfEqual(char const* text, char const* replacement, bool ignoreCase) {
     if (Compare(text ? text : "", ignoreCase) != 0)
         return false;
-    if (std::strcmp(search::ReadPtr(*this), replacement ? replacement : "") != 0)
+    if (std::strcmp(detail::ReadPtr(*this), replacement ? replacement : "") != 0)
         Assign(replacement ? replacement : "");
     return true;
 }
 
 void String::TruncateToNChars(int numChars, char const* suffix) {
     bool const mb = m_isMultiByteSupportEnabled;
-    char const* text = search::ReadPtr(*this);
+    char const* text = detail::ReadPtr(*this);
     int const numBytes = GetNumBytes();
-    int const cut = search::OffsetOfChar(text, numBytes, numChars, mb);
+    int const cut = detail::OffsetOfChar(text, numBytes, numChars, mb);
     if (cut >= numBytes)
         return;
-    edit::StableText const tail(*this, suffix, -1);
+    detail::StableText const tail(*this, suffix, -1);
     int const suffixChars = mb ? mbcs::Len(tail.data()) : tail.size();
     int const keepChars = std::max(numChars, 0) - suffixChars;
     if (tail.size() > 0 && keepChars >= 0) {
-        int const keep = search::OffsetOfChar(text, numBytes, keepChars, mb);
-        edit::Splice(*this, numBytes, keep, numBytes - keep, tail,
-                     [this](int size) { SetCachedSize(size); });
+        int const keep = detail::OffsetOfChar(text, numBytes, keepChars, mb);
+        detail::Splice(*this, numBytes, keep, numBytes - keep, tail,
+                       [this](int size) { SetCachedSize(size); });
     } else if (cut == 0) {
         Clear();
     } else {
-        SetCachedSize(edit::CutAt(*this, cut));
+        SetCachedSize(detail::CutAt(*this, cut));
     }
 }
 
@@ -177,34 +178,34 @@ void String::TruncateToNChars(int numChars, char const* suffix) {
 
 void String::TrimLeft(char const* set) {
     bool const mb = m_isMultiByteSupportEnabled;
-    char const* text = search::ReadPtr(*this);
+    char const* text = detail::ReadPtr(*this);
     int const numBytes = GetNumBytes();
     char const* p = text;
-    while (*p && search::IsInSet(scan::CharAt(p, mb), set, mb))
-        p += scan::CharBytes(p, mb);
+    while (*p && detail::IsInSet(detail::CharAt(p, mb), set, mb))
+        p += detail::CharBytes(p, mb);
     int const skipped = static_cast<int>(p - text);
     if (skipped == 0)
         return;
     if (skipped == numBytes)
         Clear();
     else
-        SetCachedSize(edit::RemoveBytes(*this, numBytes, 0, skipped));
+        SetCachedSize(detail::RemoveBytes(*this, numBytes, 0, skipped));
 }
 
 void String::TrimRight(char const* set) {
     bool const mb = m_isMultiByteSupportEnabled;
-    char const* text = search::ReadPtr(*this);
+    char const* text = detail::ReadPtr(*this);
     int const numBytes = GetNumBytes();
     int end = 0;
     if (!mb) {
         for (end = numBytes; end > 0; --end)
-            if (!search::IsInSet(static_cast<unsigned char>(text[end - 1]), set, false))
+            if (!detail::IsInSet(static_cast<unsigned char>(text[end - 1]), set, false))
                 break;
     } else {
         // Forward: the end of the last character outside the set.
         for (char const* p = text; *p;) {
-            int const width = scan::CharBytes(p, true);
-            if (!search::IsInSet(scan::CharAt(p, true), set, true))
+            int const width = detail::CharBytes(p, true);
+            if (!detail::IsInSet(detail::CharAt(p, true), set, true))
                 end = static_cast<int>(p - text) + width;
             p += width;
         }
@@ -214,7 +215,7 @@ void String::TrimRight(char const* set) {
     if (end == 0)
         Clear();
     else
-        SetCachedSize(edit::CutAt(*this, end));
+        SetCachedSize(detail::CutAt(*this, end));
 }
 
 void String::RemoveSurroundingWhiteSpace(TrimOptions options) {
@@ -233,7 +234,7 @@ void String::Append(String const& item, char const* separator) {
         AppendBytes(separator, -1);
     // Read after the separator went in: when `item` is this string its text is still the first
     // itemBytes bytes, and AppendBytes copies them aside before writing.
-    AppendBytes(search::ReadPtr(item), itemBytes);
+    AppendBytes(detail::ReadPtr(item), itemBytes);
 }
 
 void String::AppendUsingSeparator(String const& item, char const* separator) {
@@ -247,7 +248,7 @@ void String::AppendUsingSeparator(String const& item, char const* separator) {
         else if (!textEnds && !itemStarts)
             AppendBytes(separator, -1);
     }
-    AppendBytes(search::ReadPtr(item) + skip, itemBytes - skip);
+    AppendBytes(detail::ReadPtr(item) + skip, itemBytes - skip);
 }
 
 // ---- Formatting fallback -----------------------------------------------------------------
@@ -256,9 +257,9 @@ void String::HandleMissingFormatArgument(String const& placeholder, String const
     TE_WARN(RString("ERR_DESCR", "FORMAT_ARGUMENT_NOT_FOUND", nullptr, nullptr),
             "String::HandleMissingFormatArgument");
     std::string tail(" COULD NOT FIND ");
-    tail.append(search::ReadPtr(placeholder), size_t(placeholder.GetNumBytes()));
+    tail.append(detail::ReadPtr(placeholder), size_t(placeholder.GetNumBytes()));
     tail += "TO REPLACE WITH ";
-    tail.append(search::ReadPtr(argument), size_t(argument.GetNumBytes()));
+    tail.append(detail::ReadPtr(argument), size_t(argument.GetNumBytes()));
     tail += ' ';
     AppendBytes(tail.c_str(), static_cast<int>(tail.size()));
 }

@@ -27,7 +27,7 @@ char const* SpecialCharEscape(unsigned char c, bool keepLayoutChars, char (&hex)
     case '\\':
         return "\\\\";
     default:
-        if (!scan::IsControl(c))
+        if (!detail::IsControl(c))
             return nullptr;
         std::snprintf(hex, sizeof hex, "\\x%.2x", c);
         return hex;
@@ -53,8 +53,8 @@ int DecodeEscape(char const* p, bool keepLayoutChars, unsigned short* ch) {
         return 2;
     case 'x':
         // A NUL cannot live inside a text, so "\x00" is no escape either.
-        if (scan::IsHexDigit(p[2]) && scan::IsHexDigit(p[3])) {
-            int value = scan::HexValue(p[2]) * 16 + scan::HexValue(p[3]);
+        if (detail::IsHexDigit(p[2]) && detail::IsHexDigit(p[3])) {
+            int value = detail::HexValue(p[2]) * 16 + detail::HexValue(p[3]);
             if (value != 0)
                 return *ch = static_cast<unsigned short>(value), 4;
         }
@@ -71,8 +71,8 @@ bool ReadChar(char const* p, bool mb, bool keepLayoutChars, unsigned short* ch, 
         if (n > 0)
             return *bytes = n, true;
     }
-    *ch = scan::CharAt(p, mb);
-    *bytes = scan::CharBytes(p, mb);
+    *ch = detail::CharAt(p, mb);
+    *bytes = detail::CharBytes(p, mb);
     return false;
 }
 
@@ -100,8 +100,8 @@ int DecodeXmlEntity(char const* p, char* ch) {
     bool hex = p[2] == 'x';
     int i = hex ? 3 : 2, value = 0;
     int const start = i;
-    for (; hex ? scan::IsHexDigit(p[i]) : (p[i] >= '0' && p[i] <= '9'); ++i) {
-        value = value * (hex ? 16 : 10) + scan::HexValue(p[i]);
+    for (; hex ? detail::IsHexDigit(p[i]) : (p[i] >= '0' && p[i] <= '9'); ++i) {
+        value = value * (hex ? 16 : 10) + detail::HexValue(p[i]);
         if (value > 127)
             return 0; // not ASCII: left for a reader that knows the code page
     }
@@ -145,10 +145,10 @@ struct AttributeTable {
 void String::EscapeSpecialChars(bool keepLayoutChars) {
     bool const mb = IsMultiByteSupportEnabled();
     char const* text = GetBufferReadPtr();
-    scan::Rewriter out(text);
+    detail::Rewriter out(text);
     char hex[8];
     for (char const* p = text; *p;) {
-        int const n = scan::CharBytes(p, mb);
+        int const n = detail::CharBytes(p, mb);
         char const* escape =
             n == 1 ? SpecialCharEscape(static_cast<unsigned char>(*p), keepLayoutChars, hex)
                    : nullptr;
@@ -164,7 +164,7 @@ void String::EscapeSpecialChars(bool keepLayoutChars) {
 void String::UnescapeSpecialChars(bool keepLayoutChars) {
     bool const mb = IsMultiByteSupportEnabled();
     char const* text = GetBufferReadPtr();
-    scan::Rewriter out(text);
+    detail::Rewriter out(text);
     for (char const* p = text; *p;) {
         unsigned short ch = 0;
         int n = 0;
@@ -208,7 +208,7 @@ bool String::FindNextUnescapedQuoteChar(char const* text, int* index, bool* pass
                 *passedEscape = true;
             ++p; // the escaped character, whatever it is, is skipped whole
         }
-        p += scan::CharBytes(p, mb);
+        p += detail::CharBytes(p, mb);
     }
     *index = static_cast<int>(p - text);
     return *p == '"';
@@ -219,9 +219,9 @@ bool String::EscapeCharsHelper(String& text, char const* characters, char const*
         return false;
     bool const mb = IsMultiByteSupportEnabled();
     char const* p = text.GetBufferReadPtr();
-    scan::Rewriter out(p);
+    detail::Rewriter out(p);
     while (*p) {
-        int const n = scan::CharBytes(p, mb);
+        int const n = detail::CharBytes(p, mb);
         char const* replacement =
             n == 1 ? FindReplacement(static_cast<unsigned char>(*p), characters, replacements)
                    : nullptr;
@@ -247,14 +247,14 @@ bool String::EscapeHtmlChars(String& text) {
 bool String::UnEscapeXmlChars(String& text) {
     bool const mb = IsMultiByteSupportEnabled();
     char const* p = text.GetBufferReadPtr();
-    scan::Rewriter out(p);
+    detail::Rewriter out(p);
     while (*p) {
         char ch = 0;
         int n = *p == '&' ? DecodeXmlEntity(p, &ch) : 0;
         if (n > 0) {
             out.Replace(p, static_cast<unsigned char>(ch));
         } else {
-            n = scan::CharBytes(p, mb);
+            n = detail::CharBytes(p, mb);
             out.Keep(p, n);
         }
         p += n;
@@ -264,8 +264,8 @@ bool String::UnEscapeXmlChars(String& text) {
 
 bool String::ContainsIllegalXMLChar(bool forAttribute) const {
     bool const mb = IsMultiByteSupportEnabled();
-    for (char const* p = GetBufferReadPtr(); *p; p += scan::CharBytes(p, mb)) {
-        unsigned short ch = scan::CharAt(p, mb);
+    for (char const* p = GetBufferReadPtr(); *p; p += detail::CharBytes(p, mb)) {
+        unsigned short ch = detail::CharAt(p, mb);
         bool layout = ch == '\t' || ch == '\n' || ch == '\r';
         if (ch < 0x20 && (forAttribute || !layout))
             return true;
@@ -291,10 +291,10 @@ bool String::MakeValidXMLAttribute(String& text, bool singleQuoted) {
 void String::EscapeSpecialCharsForJSON() {
     bool const mb = IsMultiByteSupportEnabled();
     char const* p = GetBufferReadPtr();
-    scan::Rewriter out(p);
+    detail::Rewriter out(p);
     char escape[8];
     while (*p) {
-        int const n = scan::CharBytes(p, mb);
+        int const n = detail::CharBytes(p, mb);
         auto const c = static_cast<unsigned char>(*p);
         if (n == 1 && (c == '"' || c == '\\' || c < 0x20)) {
             std::snprintf(escape, sizeof escape, c < 0x20 ? "\\u%.4X" : "\\%c", c);

@@ -14,7 +14,7 @@ namespace tekit {
 
 namespace {
 
-using formatting::Value;
+using detail::Value;
 using FSA = FormatStringAnalysis;
 
 /// True when `text` lies in `s`'s buffer, so writing `s` could change it under us.
@@ -38,8 +38,8 @@ bool ReplacePlaceholder(String& s, StaticString<64>& placeholder, long number,
 void FormatValue(String& s, Value const& value, long number, char const* printfFormat,
                  char const* defaultFormat, char decimalPoint = '.') {
     std::string text;
-    formatting::FormatOne(text, printfFormat != nullptr ? printfFormat : defaultFormat, value,
-                          decimalPoint);
+    detail::FormatOne(text, printfFormat != nullptr ? printfFormat : defaultFormat, value,
+                      decimalPoint);
     s.Format(text.c_str(), number);
 }
 
@@ -47,13 +47,13 @@ void FormatValue(String& s, Value const& value, long number, char const* printfF
 void AppendValue(String& s, Value const& value, char const* printfFormat,
                  char const* defaultFormat) {
     std::string text;
-    formatting::FormatOne(text, printfFormat != nullptr ? printfFormat : defaultFormat, value, '.');
+    detail::FormatOne(text, printfFormat != nullptr ? printfFormat : defaultFormat, value, '.');
     s += text.c_str();
 }
 
 /// The integer kind of type T.
 template <class T> Value IntegerValue(T value) {
-    long const kind = formatting::IntegerKind(int(sizeof(T)), T(-1) < T(0));
+    long const kind = detail::IntegerKind(int(sizeof(T)), T(-1) < T(0));
     if constexpr (T(-1) < T(0))
         return Value::Signed(static_cast<std::int64_t>(value), kind);
     else
@@ -66,9 +66,9 @@ std::string DoubleText(double value, kDecimalPointLocalizationOptions options,
     char const decimalPoint = String::GetLocalizedDecimalPoint(options);
     std::string text;
     if (printfFormat == nullptr)
-        formatting::AppendShortestDouble(text, value, decimalPoint);
+        detail::AppendShortestDouble(text, value, decimalPoint);
     else
-        formatting::FormatOne(text, printfFormat, Value::Float(value), decimalPoint);
+        detail::FormatOne(text, printfFormat, Value::Float(value), decimalPoint);
     return text;
 }
 
@@ -76,9 +76,9 @@ std::string DoubleText(double value, kDecimalPointLocalizationOptions options,
 std::string PointerText(Value const& value, char const* printfFormat) {
     std::string text;
     if (printfFormat == nullptr)
-        formatting::AppendPointer(text, static_cast<std::uintptr_t>(value.bits));
+        detail::AppendPointer(text, static_cast<std::uintptr_t>(value.bits));
     else
-        formatting::FormatOne(text, printfFormat, value, '.');
+        detail::FormatOne(text, printfFormat, value, '.');
     return text;
 }
 
@@ -201,13 +201,13 @@ void String::Append(double value, kDecimalPointLocalizationOptions options,
 
 void String::AppendSize(std::size_t size) {
     std::string text;
-    formatting::AppendDecimal(text, static_cast<std::uint64_t>(size));
+    detail::AppendDecimal(text, static_cast<std::uint64_t>(size));
     *this += text.c_str();
 }
 
 void String::AppendPtr(void const* ptr) {
     std::string text;
-    formatting::AppendPointer(text, reinterpret_cast<std::uintptr_t>(ptr));
+    detail::AppendPointer(text, reinterpret_cast<std::uintptr_t>(ptr));
     *this += text.c_str();
 }
 
@@ -215,7 +215,7 @@ void String::AppendPtr(void const* ptr) {
 
 void String::VSPrintf(char const* format, std::va_list args) {
     std::string text;
-    formatting::FormatArgs(text, format, args);
+    detail::FormatArgs(text, format, args);
     if (text.size() >= size_t(INT_MAX))
         Throw32BitOverflowException("String::VSPrintf", TE_FILE_BASE_NAME, __LINE__, true);
     AssignUsingNumBytesInsteadOfNumChars(text.c_str(), int(text.size()), false);

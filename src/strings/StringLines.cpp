@@ -38,7 +38,7 @@ public:
         line.startChar = m_chars;
         char const* p = m_text + m_pos;
         for (; *p && *p != '\n' && *p != '\r'; ++m_chars)
-            p += scan::CharBytes(p, m_mb);
+            p += detail::CharBytes(p, m_mb);
         line.end = static_cast<int>(p - m_text);
         int const endingBytes = (*p == '\r' && p[1] == '\n') ? 2 : (*p ? 1 : 0);
         line.next = line.end + endingBytes;
@@ -74,7 +74,7 @@ bool IsLoneEnding(char const* p, bool afterCR) {
 } // namespace
 
 int String::GetNumLines() const {
-    LineWalker walker(search::ReadPtr(*this), m_isMultiByteSupportEnabled);
+    LineWalker walker(detail::ReadPtr(*this), m_isMultiByteSupportEnabled);
     Line line;
     int count = 0;
     while (walker.Next(line))
@@ -83,7 +83,7 @@ int String::GetNumLines() const {
 }
 
 void String::GetNthLine(int lineIndex, String& out) const {
-    char const* text = search::ReadPtr(*this);
+    char const* text = detail::ReadPtr(*this);
     Line line;
     if (!FindLine(text, lineIndex, m_isMultiByteSupportEnabled, line)) {
         out.Clear();
@@ -95,7 +95,7 @@ void String::GetNthLine(int lineIndex, String& out) const {
 
 int String::CharOffsetOfLine(int lineIndex) const {
     Line line;
-    if (!FindLine(search::ReadPtr(*this), lineIndex, m_isMultiByteSupportEnabled, line))
+    if (!FindLine(detail::ReadPtr(*this), lineIndex, m_isMultiByteSupportEnabled, line))
         return -1;
     return line.startChar;
 }
@@ -103,16 +103,16 @@ int String::CharOffsetOfLine(int lineIndex) const {
 void String::RemoveNthLine(int lineIndex) {
     int const numBytes = GetNumBytes();
     Line line;
-    if (!FindLine(search::ReadPtr(*this), lineIndex, m_isMultiByteSupportEnabled, line))
+    if (!FindLine(detail::ReadPtr(*this), lineIndex, m_isMultiByteSupportEnabled, line))
         return;
     if (line.next - line.start == numBytes)
         Clear();
     else
-        SetCachedSize(edit::RemoveBytes(*this, numBytes, line.start, line.next - line.start));
+        SetCachedSize(detail::RemoveBytes(*this, numBytes, line.start, line.next - line.start));
 }
 
 void String::TruncateToNLines(int numLines) {
-    char const* text = search::ReadPtr(*this);
+    char const* text = detail::ReadPtr(*this);
     Line line;
     if (numLines <= 0) {
         if (*text)
@@ -124,25 +124,25 @@ void String::TruncateToNLines(int numLines) {
     if (line.end == 0)
         Clear();
     else
-        SetCachedSize(edit::CutAt(*this, line.end));
+        SetCachedSize(detail::CutAt(*this, line.end));
 }
 
 void String::ConvertToCRLF() {
     bool const mb = m_isMultiByteSupportEnabled;
-    char const* text = search::ReadPtr(*this);
+    char const* text = detail::ReadPtr(*this);
     int const numBytes = GetNumBytes();
     int added = 0;
     bool afterCR = false;
-    for (char const* p = text; *p; p += scan::CharBytes(p, mb)) {
+    for (char const* p = text; *p; p += detail::CharBytes(p, mb)) {
         added += IsLoneEnding(p, afterCR) ? 1 : 0;
-        afterCR = scan::IsSingle(p, mb, '\r');
+        afterCR = detail::IsSingle(p, mb, '\r');
     }
     if (added == 0)
         return;
     std::string result;
     result.reserve(size_t(numBytes) + size_t(added));
     for (char const* p = text; *p;) {
-        int width = scan::CharBytes(p, mb);
+        int width = detail::CharBytes(p, mb);
         if (*p == '\r' || *p == '\n') {
             result += "\r\n";
             width = (*p == '\r' && p[1] == '\n') ? 2 : 1;
@@ -157,12 +157,13 @@ void String::ConvertToCRLF() {
 void String::ConvertFromCRLF() {
     bool const mb = m_isMultiByteSupportEnabled;
     int const numBytes = GetNumBytes();
-    char const* found = search::ReadPtr(*this);
-    for (; *found && !(found[0] == '\r' && found[1] == '\n'); found += scan::CharBytes(found, mb)) {
+    char const* found = detail::ReadPtr(*this);
+    for (; *found && !(found[0] == '\r' && found[1] == '\n');
+         found += detail::CharBytes(found, mb)) {
     }
     if (*found == '\0')
         return;
-    int const from = static_cast<int>(found - search::ReadPtr(*this));
+    int const from = static_cast<int>(found - detail::ReadPtr(*this));
     // Compacting in place: the write position never passes the read position.
     char* p = GetBufferWritePtr();
     int to = from;
@@ -171,7 +172,7 @@ void String::ConvertFromCRLF() {
             ++i;
             continue;
         }
-        int const width = scan::CharBytes(p + i, mb);
+        int const width = detail::CharBytes(p + i, mb);
         for (int k = 0; k < width; ++k)
             p[to++] = p[i++];
     }
@@ -184,10 +185,10 @@ int String::GetIndexIfConvertToCRLF(int charIndex) const {
     int index = 0;
     int added = 0;
     bool afterCR = false;
-    for (char const* p = search::ReadPtr(*this); *p && index < charIndex;
-         p += scan::CharBytes(p, mb), ++index) {
+    for (char const* p = detail::ReadPtr(*this); *p && index < charIndex;
+         p += detail::CharBytes(p, mb), ++index) {
         added += IsLoneEnding(p, afterCR) ? 1 : 0;
-        afterCR = scan::IsSingle(p, mb, '\r');
+        afterCR = detail::IsSingle(p, mb, '\r');
     }
     return index + added;
 }
@@ -196,8 +197,8 @@ int String::GetIndexIfConvertFromCRLF(int charIndex) const {
     bool const mb = m_isMultiByteSupportEnabled;
     int index = 0;
     int removed = 0;
-    for (char const* p = search::ReadPtr(*this); *p && index < charIndex;
-         p += scan::CharBytes(p, mb), ++index)
+    for (char const* p = detail::ReadPtr(*this); *p && index < charIndex;
+         p += detail::CharBytes(p, mb), ++index)
         removed += (p[0] == '\r' && p[1] == '\n') ? 1 : 0;
     return index - removed;
 }

@@ -34,8 +34,8 @@ struct PatternToken {
 unsigned short ReadPatternChar(char const*& p, bool mb) {
     if (*p == '\\' && p[1])
         ++p;
-    unsigned short ch = scan::CharAt(p, mb);
-    p += scan::CharBytes(p, mb);
+    unsigned short ch = detail::CharAt(p, mb);
+    p += detail::CharBytes(p, mb);
     return ch;
 }
 
@@ -91,9 +91,9 @@ struct Text {
 
     Text(char const* text, bool mb) {
         char const* p = text;
-        for (; *p; p += scan::CharBytes(p, mb)) {
+        for (; *p; p += detail::CharBytes(p, mb)) {
             offsets.push_back(static_cast<int>(p - text));
-            chars.push_back(scan::CharAt(p, mb));
+            chars.push_back(detail::CharAt(p, mb));
         }
         offsets.push_back(static_cast<int>(p - text));
     }
@@ -239,7 +239,7 @@ void AppendReplacement(std::string& out, char const* replacement, StringVector c
             out += '\\';
             p += 2;
         } else {
-            int const n = scan::CharBytes(p, mb);
+            int const n = detail::CharBytes(p, mb);
             out.append(p, static_cast<size_t>(n));
             p += n;
         }
@@ -251,11 +251,11 @@ void AppendReplacement(std::string& out, char const* replacement, StringVector c
 bool OccursAt(char const* p, char const* find, bool mb, bool ignoreCase, int& bytes) {
     char const* start = p;
     while (*find) {
-        unsigned short a = scan::CharAt(p, mb), b = scan::CharAt(find, mb);
+        unsigned short a = detail::CharAt(p, mb), b = detail::CharAt(find, mb);
         if (a != b && !(ignoreCase && mbcs::ToLower(a) == mbcs::ToLower(b)))
             return false;
-        p += scan::CharBytes(p, mb);
-        find += scan::CharBytes(find, mb);
+        p += detail::CharBytes(p, mb);
+        find += detail::CharBytes(find, mb);
     }
     bytes = static_cast<int>(p - start);
     return true;
@@ -272,11 +272,11 @@ int FindPositions(char const* text, char const* find, bool ignoreCase,
         int bytes = 0;
         if (OccursAt(p, find, mb, ignoreCase, bytes)) {
             positions.push_back(index);
-            index += scan::CharIndexOfByte(p, bytes, mb);
+            index += detail::CharIndexOfByte(p, bytes, mb);
             p += bytes;
         } else {
             ++index;
-            p += scan::CharBytes(p, mb);
+            p += detail::CharBytes(p, mb);
         }
     }
     return static_cast<int>(positions.size());
@@ -352,7 +352,7 @@ int String::ReplaceAllPatterns(char const* pattern, char const* replacement, boo
     }
     if (count > 0) {
         out += Slice(text, t, copied, t.Size());
-        scan::AssignResult(*this, out);
+        detail::AssignResult(*this, out);
     }
     return count;
 }

@@ -12,7 +12,7 @@ void String::Quote() {
     out += '"';
     out += GetBufferReadPtr();
     out += '"';
-    scan::AssignResult(*this, out);
+    detail::AssignResult(*this, out);
 }
 
 void String::EscapeQuotes() {
@@ -43,7 +43,7 @@ bool String::RemoveSurroundingQuotes() {
     if (!IsSurroundedByQuotes())
         return false;
     std::string inner(GetBufferReadPtr() + 1, static_cast<size_t>(GetNumBytes() - 2));
-    scan::AssignResult(*this, inner);
+    detail::AssignResult(*this, inner);
     return true;
 }
 

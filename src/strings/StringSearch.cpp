@@ -11,7 +11,7 @@
 
 namespace tekit {
 
-namespace search {
+namespace detail {
 
 namespace {
 
@@ -19,11 +19,11 @@ namespace {
 bool IsWholeWordAt(char const* text, char const* p, int bytes, bool mb) {
     if (p > text) {
         char const* before = mb ? mbcs::Dec(text, p) : p - 1;
-        if (String::IsCharWholeWordChar(scan::CharAt(before, mb)))
+        if (String::IsCharWholeWordChar(detail::CharAt(before, mb)))
             return false;
     }
     char const* after = p + bytes;
-    return *after == '\0' || !String::IsCharWholeWordChar(scan::CharAt(after, mb));
+    return *after == '\0' || !String::IsCharWholeWordChar(detail::CharAt(after, mb));
 }
 
 /// Single-byte, case respected: the library's fastest path, a plain byte search.
@@ -49,16 +49,16 @@ bool MatchesAt(char const* p, Needle const& needle, bool mb) {
     char const* q = needle.text;
     char const* const end = needle.text + needle.bytes;
     while (q < end) {
-        unsigned short a = scan::CharAt(p, true);
-        unsigned short b = scan::CharAt(q, true);
+        unsigned short a = detail::CharAt(p, true);
+        unsigned short b = detail::CharAt(q, true);
         if (needle.ignoreCase) {
             a = mbcs::ToLower(a);
             b = mbcs::ToLower(b);
         }
         if (a != b || a == 0)
             return false;
-        p += scan::CharBytes(p, true);
-        q += scan::CharBytes(q, true);
+        p += detail::CharBytes(p, true);
+        q += detail::CharBytes(q, true);
     }
     return true;
 }
@@ -75,7 +75,7 @@ int FindNext(char const* text, int textBytes, int from, Needle const& needle, bo
         if (MatchesAt(p, needle, mb) &&
             (!needle.wholeWord || IsWholeWordAt(text, p, needle.bytes, mb)))
             return static_cast<int>(p - text);
-        int const step = scan::CharBytes(p, mb);
+        int const step = detail::CharBytes(p, mb);
         if (step == 0)
             break;
         p += step;
@@ -85,14 +85,14 @@ int FindNext(char const* text, int textBytes, int from, Needle const& needle, bo
 
 bool IsInSet(unsigned short ch, char const* set, bool mb) {
     if (!set)
-        return scan::IsWhiteSpace(ch);
-    for (char const* q = set; *q; q += scan::CharBytes(q, mb))
-        if (scan::CharAt(q, mb) == ch)
+        return detail::IsWhiteSpace(ch);
+    for (char const* q = set; *q; q += detail::CharBytes(q, mb))
+        if (detail::CharAt(q, mb) == ch)
             return true;
     return false;
 }
 
-} // namespace search
+} // namespace detail
 
 namespace {
 
@@ -109,7 +109,7 @@ bool IsCharBoundary(char const* text, char const* p, bool mb) {
 
 int String::FindChar(unsigned short ch, int startIndex) const {
     bool const mb = m_isMultiByteSupportEnabled;
-    char const* text = search::ReadPtr(*this);
+    char const* text = detail::ReadPtr(*this);
     int const numBytes = GetNumBytes();
     if (ch == 0 || (!mb && ch > 0xFF))
         return -1;
@@ -119,15 +119,15 @@ int String::FindChar(unsigned short ch, int startIndex) const {
         return hit ? static_cast<int>(static_cast<char const*>(hit) - text) : -1;
     }
     int index = 0;
-    for (char const* p = text; *p; p += scan::CharBytes(p, true), ++index)
-        if (index >= startIndex && scan::CharAt(p, true) == ch)
+    for (char const* p = text; *p; p += detail::CharBytes(p, true), ++index)
+        if (index >= startIndex && detail::CharAt(p, true) == ch)
             return index;
     return -1;
 }
 
 int String::FindCharReverse(unsigned short ch, int startIndex) const {
     bool const mb = m_isMultiByteSupportEnabled;
-    char const* text = search::ReadPtr(*this);
+    char const* text = detail::ReadPtr(*this);
     int const numBytes = GetNumBytes();
     if (ch == 0 || (!mb && ch > 0xFF))
         return -1;
@@ -142,8 +142,8 @@ int String::FindCharReverse(unsigned short ch, int startIndex) const {
     int found = -1;
     int index = 0;
     for (char const* p = text; *p && (startIndex < 0 || index <= startIndex);
-         p += scan::CharBytes(p, true), ++index)
-        if (scan::CharAt(p, true) == ch)
+         p += detail::CharBytes(p, true), ++index)
+        if (detail::CharAt(p, true) == ch)
             found = index;
     return found;
 }
@@ -152,15 +152,15 @@ int String::FindCharInSet(char const* set, int startIndex) const {
     if (!set || *set == '\0')
         return -1;
     bool const mb = m_isMultiByteSupportEnabled;
-    char const* text = search::ReadPtr(*this);
-    int const from = search::OffsetOfChar(text, GetNumBytes(), startIndex, mb);
+    char const* text = detail::ReadPtr(*this);
+    int const from = detail::OffsetOfChar(text, GetNumBytes(), startIndex, mb);
     if (!mb) {
         char const* hit = std::strpbrk(text + from, set);
         return hit ? static_cast<int>(hit - text) : -1;
     }
     int index = std::max(startIndex, 0);
-    for (char const* p = text + from; *p; p += scan::CharBytes(p, true), ++index)
-        if (search::IsInSet(scan::CharAt(p, true), set, true))
+    for (char const* p = text + from; *p; p += detail::CharBytes(p, true), ++index)
+        if (detail::IsInSet(detail::CharAt(p, true), set, true))
             return index;
     return -1;
 }
@@ -171,38 +171,38 @@ bool String::ContainsCharInSet(char const* set) const {
 
 int String::FindSubstring(char const* text, int startIndex, bool ignoreCase) const {
     bool const mb = m_isMultiByteSupportEnabled;
-    char const* own = search::ReadPtr(*this);
+    char const* own = detail::ReadPtr(*this);
     int const numBytes = GetNumBytes();
-    search::Needle const needle{text, Length(text), ignoreCase, false};
-    int const from = search::OffsetOfChar(own, numBytes, startIndex, mb);
-    int const at = search::FindNext(own, numBytes, from, needle, mb);
-    return at < 0 ? -1 : search::IndexOfOffset(own, at, mb);
+    detail::Needle const needle{text, Length(text), ignoreCase, false};
+    int const from = detail::OffsetOfChar(own, numBytes, startIndex, mb);
+    int const at = detail::FindNext(own, numBytes, from, needle, mb);
+    return at < 0 ? -1 : detail::IndexOfOffset(own, at, mb);
 }
 
 int String::FindSubstring(String const& text, int startIndex, bool ignoreCase) const {
     bool const mb = m_isMultiByteSupportEnabled;
-    char const* own = search::ReadPtr(*this);
+    char const* own = detail::ReadPtr(*this);
     int const numBytes = GetNumBytes();
-    search::Needle const needle{search::ReadPtr(text), text.GetNumBytes(), ignoreCase, false};
-    int const from = search::OffsetOfChar(own, numBytes, startIndex, mb);
-    int const at = search::FindNext(own, numBytes, from, needle, mb);
-    return at < 0 ? -1 : search::IndexOfOffset(own, at, mb);
+    detail::Needle const needle{detail::ReadPtr(text), text.GetNumBytes(), ignoreCase, false};
+    int const from = detail::OffsetOfChar(own, numBytes, startIndex, mb);
+    int const at = detail::FindNext(own, numBytes, from, needle, mb);
+    return at < 0 ? -1 : detail::IndexOfOffset(own, at, mb);
 }
 
 bool String::ContainsSubstring(char const* text, bool ignoreCase) const {
-    search::Needle const needle{text, Length(text), ignoreCase, false};
-    return search::FindNext(search::ReadPtr(*this), GetNumBytes(), 0, needle,
+    detail::Needle const needle{text, Length(text), ignoreCase, false};
+    return detail::FindNext(detail::ReadPtr(*this), GetNumBytes(), 0, needle,
                             m_isMultiByteSupportEnabled) >= 0;
 }
 
 int String::GetNumOccurrences(char const* text, bool ignoreCase) const {
     bool const mb = m_isMultiByteSupportEnabled;
-    char const* own = search::ReadPtr(*this);
+    char const* own = detail::ReadPtr(*this);
     int const numBytes = GetNumBytes();
-    search::Needle const needle{text, Length(text), ignoreCase, false};
+    detail::Needle const needle{text, Length(text), ignoreCase, false};
     int count = 0;
-    for (int at = search::FindNext(own, numBytes, 0, needle, mb); at >= 0;
-         at = search::FindNext(own, numBytes, at + needle.bytes, needle, mb))
+    for (int at = detail::FindNext(own, numBytes, 0, needle, mb); at >= 0;
+         at = detail::FindNext(own, numBytes, at + needle.bytes, needle, mb))
         ++count;
     return count;
 }
@@ -212,38 +212,38 @@ int String::GetNumOccurrences(unsigned short ch) const {
     if (ch == 0)
         return 0;
     int count = 0;
-    for (char const* p = search::ReadPtr(*this); *p; p += scan::CharBytes(p, mb))
-        if (scan::CharAt(p, mb) == ch)
+    for (char const* p = detail::ReadPtr(*this); *p; p += detail::CharBytes(p, mb))
+        if (detail::CharAt(p, mb) == ch)
             ++count;
     return count;
 }
 
 bool String::StartsWith(char const* text, bool ignoreCase) const {
-    search::Needle const needle{text, Length(text), ignoreCase, false};
+    detail::Needle const needle{text, Length(text), ignoreCase, false};
     if (needle.bytes == 0)
         return true;
     if (needle.bytes > GetNumBytes())
         return false;
-    return search::MatchesAt(search::ReadPtr(*this), needle, m_isMultiByteSupportEnabled);
+    return detail::MatchesAt(detail::ReadPtr(*this), needle, m_isMultiByteSupportEnabled);
 }
 
 bool String::EndsWith(char const* text, bool ignoreCase) const {
     bool const mb = m_isMultiByteSupportEnabled;
-    search::Needle const needle{text, Length(text), ignoreCase, false};
+    detail::Needle const needle{text, Length(text), ignoreCase, false};
     int const numBytes = GetNumBytes();
     if (needle.bytes == 0)
         return true;
     if (needle.bytes > numBytes)
         return false;
-    char const* own = search::ReadPtr(*this);
+    char const* own = detail::ReadPtr(*this);
     char const* start = own + numBytes - needle.bytes;
-    return IsCharBoundary(own, start, mb) && search::MatchesAt(start, needle, mb);
+    return IsCharBoundary(own, start, mb) && detail::MatchesAt(start, needle, mb);
 }
 
 bool String::ContainsCntrlChar() const {
     bool const mb = m_isMultiByteSupportEnabled;
-    for (char const* p = search::ReadPtr(*this); *p; p += scan::CharBytes(p, mb))
-        if (scan::IsControl(scan::CharAt(p, mb)))
+    for (char const* p = detail::ReadPtr(*this); *p; p += detail::CharBytes(p, mb))
+        if (detail::IsControl(detail::CharAt(p, mb)))
             return true;
     return false;
 }
@@ -256,11 +256,11 @@ namespace {
 /// `skipWhiteSpace`, or the text's length in characters.
 int SkipWhile(String const& s, int charIndex, bool skipWhiteSpace) {
     bool const mb = String::IsMultiByteSupportEnabled();
-    char const* text = search::ReadPtr(s);
-    int const from = search::OffsetOfChar(text, s.GetNumBytes(), charIndex, mb);
-    int index = mb ? search::IndexOfOffset(text, from, true) : from;
-    for (char const* p = text + from; *p; p += scan::CharBytes(p, mb), ++index)
-        if (scan::IsWhiteSpace(scan::CharAt(p, mb)) != skipWhiteSpace)
+    char const* text = detail::ReadPtr(s);
+    int const from = detail::OffsetOfChar(text, s.GetNumBytes(), charIndex, mb);
+    int index = mb ? detail::IndexOfOffset(text, from, true) : from;
+    for (char const* p = text + from; *p; p += detail::CharBytes(p, mb), ++index)
+        if (detail::IsWhiteSpace(detail::CharAt(p, mb)) != skipWhiteSpace)
             break;
     return index;
 }

@@ -14,12 +14,12 @@ namespace {
 /// double-byte character is never cut.
 std::string Trimmed(char const* begin, char const* end, bool mb) {
     char const* first = begin;
-    while (first < end && scan::IsWhiteSpace(scan::CharAt(first, mb)))
-        first += scan::CharBytes(first, mb);
+    while (first < end && detail::IsWhiteSpace(detail::CharAt(first, mb)))
+        first += detail::CharBytes(first, mb);
     char const* last = first; // one past the last character that is not white space
-    for (char const* p = first; p < end; p += scan::CharBytes(p, mb))
-        if (!scan::IsWhiteSpace(scan::CharAt(p, mb)))
-            last = p + scan::CharBytes(p, mb);
+    for (char const* p = first; p < end; p += detail::CharBytes(p, mb))
+        if (!detail::IsWhiteSpace(detail::CharAt(p, mb)))
+            last = p + detail::CharBytes(p, mb);
     return std::string(first, static_cast<size_t>(last - first));
 }
 
@@ -51,8 +51,8 @@ void String::Split(StringVector& items, char const* separators, bool skipEmptyIt
     if (*text) {
         char const* itemStart = text;
         char const* p = text;
-        for (; *p; p += scan::CharBytes(p, mb)) {
-            if (scan::CharBytes(p, mb) == 1 && std::strchr(set, *p)) {
+        for (; *p; p += detail::CharBytes(p, mb)) {
+            if (detail::CharBytes(p, mb) == 1 && std::strchr(set, *p)) {
                 emit(itemStart, p);
                 itemStart = p + 1;
             }
@@ -78,7 +78,7 @@ void String::Split(StringVector& items, StringVector const& separators) const {
                 p += n;
                 itemStart = p;
             } else {
-                p += scan::CharBytes(p, mb);
+                p += detail::CharBytes(p, mb);
             }
         }
         result.emplace_back(std::string(itemStart, static_cast<size_t>(p - itemStart)).c_str());

@@ -16,13 +16,13 @@ namespace {
 char const* SkipToken(char const* p, bool mb) {
     bool quoted = false;
     while (*p) {
-        if (!quoted && scan::IsWhiteSpace(scan::CharAt(p, mb)))
+        if (!quoted && detail::IsWhiteSpace(detail::CharAt(p, mb)))
             break;
-        if (scan::IsSingle(p, mb, '"'))
+        if (detail::IsSingle(p, mb, '"'))
             quoted = !quoted;
         else if (quoted && *p == '\\' && p[1])
             ++p; // the escaped character belongs to the run, whatever it is
-        p += scan::CharBytes(p, mb);
+        p += detail::CharBytes(p, mb);
     }
     return p;
 }
@@ -30,8 +30,8 @@ char const* SkipToken(char const* p, bool mb) {
 /// Finds the first token at or after byte `offset`: its byte offset and bytes, or false.
 bool NextTokenBytes(char const* text, int offset, bool mb, int& start, int& bytes) {
     char const* p = text + offset;
-    while (*p && scan::IsWhiteSpace(scan::CharAt(p, mb)))
-        p += scan::CharBytes(p, mb);
+    while (*p && detail::IsWhiteSpace(detail::CharAt(p, mb)))
+        p += detail::CharBytes(p, mb);
     if (!*p)
         return false;
     start = static_cast<int>(p - text);
@@ -66,7 +66,7 @@ private:
     std::string ReadName(char const* function) {
         int const start = m_pos;
         for (char const* p = m_text + m_pos; *p && *p != '.' && *p != '['; p = m_text + m_pos)
-            m_pos += scan::CharBytes(p, m_mb);
+            m_pos += detail::CharBytes(p, m_mb);
         if (m_pos == start)
             Fail("LOCATION_EMPTY_PART_1", function);
         return std::string(m_text + start, static_cast<size_t>(m_pos - start));
@@ -103,7 +103,7 @@ private:
         for (char const* p = m_text + m_pos; *p != ']'; p = m_text + m_pos) {
             if (!*p)
                 Fail("LOCATION_MISSING_CLOSING_BRACKET_1", function);
-            m_pos += scan::CharBytes(p, m_mb);
+            m_pos += detail::CharBytes(p, m_mb);
         }
         return std::string(m_text + start, static_cast<size_t>(m_pos - start));
     }
@@ -121,10 +121,10 @@ int String::GetNextToken(int startIndex, int& tokenLength) const {
     char const* text = GetBufferReadPtr();
     int start = 0, bytes = 0;
     tokenLength = 0;
-    if (!NextTokenBytes(text, scan::ByteOffsetOfChar(text, startIndex, mb), mb, start, bytes))
+    if (!NextTokenBytes(text, detail::ByteOffsetOfChar(text, startIndex, mb), mb, start, bytes))
         return -1;
-    int const index = scan::CharIndexOfByte(text, start, mb);
-    tokenLength = scan::CharIndexOfByte(text, start + bytes, mb) - index;
+    int const index = detail::CharIndexOfByte(text, start, mb);
+    tokenLength = detail::CharIndexOfByte(text, start + bytes, mb) - index;
     return index;
 }
 
@@ -136,7 +136,7 @@ bool String::GetNthToken(int tokenIndex, String& token) const {
     for (int i = 0, offset = 0; found && i <= tokenIndex; ++i, offset = start + bytes)
         found = NextTokenBytes(text, offset, mb, start, bytes);
     std::string const result = found ? std::string(text + start, static_cast<size_t>(bytes)) : "";
-    scan::AssignResult(token, result);
+    detail::AssignResult(token, result);
     return found;
 }
 
@@ -148,8 +148,8 @@ bool String::GetNextLocationStringToken(String& location, String& token, bool re
         return false;
     }
     std::string const part = reader.Next("String::GetNextLocationStringToken");
-    scan::AssignResult(location, reader.Rest());
-    scan::AssignResult(token, part);
+    detail::AssignResult(location, reader.Rest());
+    detail::AssignResult(token, part);
     return true;
 }
 
@@ -178,11 +178,11 @@ bool String::IsPtrToWholeWord(char const* text, char const* ptr, int numBytes) {
     bool const mb = IsMultiByteSupportEnabled();
     if (ptr > text) {
         char const* before = mb ? mbcs::Dec(text, ptr) : ptr - 1;
-        if (IsCharWholeWordChar(scan::CharAt(before, mb)))
+        if (IsCharWholeWordChar(detail::CharAt(before, mb)))
             return false;
     }
     char const* after = ptr + numBytes;
-    return *after == '\0' || !IsCharWholeWordChar(scan::CharAt(after, mb));
+    return *after == '\0' || !IsCharWholeWordChar(detail::CharAt(after, mb));
 }
 
 int String::FindCharReverseIgnoringEmbeddedStringConstants(unsigned short ch,
@@ -193,8 +193,8 @@ int String::FindCharReverseIgnoringEmbeddedStringConstants(unsigned short ch,
     bool quoted = false;
     char const* p = GetBufferReadPtr();
     for (int index = 0; *p && (startIndex < 0 || index <= startIndex); ++index) {
-        bool const isQuote = scan::IsSingle(p, mb, '"');
-        if (!quoted && !isQuote && scan::CharAt(p, mb) == ch)
+        bool const isQuote = detail::IsSingle(p, mb, '"');
+        if (!quoted && !isQuote && detail::CharAt(p, mb) == ch)
             found = index;
         if (isQuote)
             quoted = !quoted;
@@ -202,7 +202,7 @@ int String::FindCharReverseIgnoringEmbeddedStringConstants(unsigned short ch,
             ++p; // an escaped character is part of the constant
             ++index;
         }
-        p += scan::CharBytes(p, mb);
+        p += detail::CharBytes(p, mb);
     }
     return found;
 }

@@ -20,8 +20,8 @@ char CheckedDelimiter(char delimiter, char const* function) {
 }
 
 bool NeedsQuotes(char const* item, char delimiter, bool mb) {
-    for (char const* p = item; *p; p += scan::CharBytes(p, mb))
-        if (scan::CharBytes(p, mb) == 1 &&
+    for (char const* p = item; *p; p += detail::CharBytes(p, mb))
+        if (detail::CharBytes(p, mb) == 1 &&
             (*p == delimiter || *p == '"' || *p == '\r' || *p == '\n'))
             return true;
     return false;
@@ -30,7 +30,7 @@ bool NeedsQuotes(char const* item, char delimiter, bool mb) {
 void AppendQuoted(std::string& out, char const* item, bool mb) {
     out += '"';
     for (char const* p = item; *p;) {
-        int const n = scan::CharBytes(p, mb);
+        int const n = detail::CharBytes(p, mb);
         if (n == 1 && *p == '"')
             out += '"';
         out.append(p, static_cast<size_t>(n));
@@ -54,14 +54,14 @@ char const* ReadItem(char const* p, char delimiter, bool mb, char const* whole, 
             }
             if (*p == '"')
                 break;
-            int const n = scan::CharBytes(p, mb);
+            int const n = detail::CharBytes(p, mb);
             item.append(p, static_cast<size_t>(n));
             p += n;
         }
         ++p; // past the closing quote
     }
-    while (*p && !scan::IsSingle(p, mb, delimiter)) {
-        int const n = scan::CharBytes(p, mb);
+    while (*p && !detail::IsSingle(p, mb, delimiter)) {
+        int const n = detail::CharBytes(p, mb);
         item.append(p, static_cast<size_t>(n));
         p += n;
     }
@@ -84,7 +84,7 @@ void StringVector::CreateCSVString(String& csv, char delimiter) const {
         else
             out += item;
     }
-    scan::AssignResult(csv, out);
+    detail::AssignResult(csv, out);
 }
 
 void StringVector::SetFromCSVString(String const& csv, char delimiter) {
@@ -110,7 +110,7 @@ void StringVector::Join(String& result, char const* separator) const {
             out += separator;
         out += (*this)[i].GetBufferReadPtr();
     }
-    scan::AssignResult(result, out);
+    detail::AssignResult(result, out);
 }
 
 int StringVector::Find(char const* text, bool ignoreCase) const {

@@ -11,7 +11,7 @@ namespace tekit {
 int String::ConvertToUnicodeInBufferTruncateIfNeeded(wchar_t* buffer, int size) const {
     if (!buffer || size < 1)
         return 0;
-    std::wstring const text = wide::ToWide(GetBufferReadPtr(), GetNumBytes());
+    std::wstring const text = detail::ToWide(GetBufferReadPtr(), GetNumBytes());
     int n = std::min(static_cast<int>(text.size()), size - 1);
     // Where wchar_t is UTF-16, a cut never leaves the first half of a surrogate pair.
     if (sizeof(wchar_t) == 2 && n > 0 && text[size_t(n - 1)] >= 0xD800 &&
@@ -23,8 +23,8 @@ int String::ConvertToUnicodeInBufferTruncateIfNeeded(wchar_t* buffer, int size) 
 }
 
 char* String::AllocUTF8(char* buffer, long size, long* length) const {
-    std::wstring const text = wide::ToWide(GetBufferReadPtr(), GetNumBytes());
-    std::string const utf8 = wide::WideToUtf8(text.c_str(), static_cast<int>(text.size()));
+    std::wstring const text = detail::ToWide(GetBufferReadPtr(), GetNumBytes());
+    std::string const utf8 = detail::WideToUtf8(text.c_str(), static_cast<int>(text.size()));
     if (length)
         *length = static_cast<long>(utf8.size());
     char* out = buffer;
@@ -40,8 +40,8 @@ void String::FreeUTF8(char* utf8) {
 }
 
 void String::AssignFromUTF8(char const* utf8, int numBytes) {
-    std::wstring const text = wide::Utf8ToWide(utf8, numBytes);
-    std::string const narrow = wide::ToNarrow(text.c_str(), static_cast<int>(text.size()));
+    std::wstring const text = detail::Utf8ToWide(utf8, numBytes);
+    std::string const narrow = detail::ToNarrow(text.c_str(), static_cast<int>(text.size()));
     AssignUsingNumBytesInsteadOfNumChars(narrow.c_str(), static_cast<int>(narrow.size()), false);
 }
 

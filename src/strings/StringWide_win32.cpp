@@ -15,12 +15,12 @@ void String::Assign(_bstr_t const& text) {
 }
 
 BSTR String::AllocSysString() const {
-    std::wstring const text = wide::ToWide(GetBufferReadPtr(), GetNumBytes());
+    std::wstring const text = detail::ToWide(GetBufferReadPtr(), GetNumBytes());
     return ::SysAllocStringLen(text.data(), static_cast<UINT>(text.size()));
 }
 
 String::operator _bstr_t() const {
-    std::wstring const text = wide::ToWide(GetBufferReadPtr(), GetNumBytes());
+    std::wstring const text = detail::ToWide(GetBufferReadPtr(), GetNumBytes());
     return _bstr_t(text.c_str());
 }
 

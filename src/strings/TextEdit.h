@@ -5,7 +5,7 @@
 // when it is not known) for the calling member to store:
 //
 //   StableText const text(*this, replacement, -1);  // copied aside only if it points into us
-//   SetCachedSize(edit::InsertBytes(*this, length, offset, text.data(), text.size()));
+//   SetCachedSize(detail::InsertBytes(*this, length, offset, text.data(), text.size()));
 #pragma once
 
 #include "tekit/errors/Raise.h"
@@ -16,7 +16,7 @@
 #include <cstring>
 #include <string>
 
-namespace tekit::edit {
+namespace tekit::detail {
 
 /// A text argument made safe against writes to `target`: when it points into the target's
 /// buffer (which a write may move or overwrite) it is copied aside first. Either way data()
@@ -107,4 +107,4 @@ void Splice(String& s, int length, int offset, int removeBytes, StableText const
         setSize(InsertBytes(s, length, offset, text.data(), text.size()));
 }
 
-} // namespace tekit::edit
+} // namespace tekit::detail

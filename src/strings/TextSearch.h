@@ -5,8 +5,8 @@
 // candidate match starts only where a character starts, so the trail byte of a double-byte
 // character (which may equal an ASCII letter) never starts or ends a match.
 //
-//   search::Needle needle{find, findBytes, /*ignoreCase*/ true, /*wholeWord*/ false};
-//   int at = search::FindNext(text, textBytes, 0, needle, mb);   // byte offset or -1
+//   detail::Needle needle{find, findBytes, /*ignoreCase*/ true, /*wholeWord*/ false};
+//   int at = detail::FindNext(text, textBytes, 0, needle, mb);   // byte offset or -1
 #pragma once
 
 #include "strings/CharScan.h"
@@ -14,7 +14,7 @@
 
 #include <algorithm>
 
-namespace tekit::search {
+namespace tekit::detail {
 
 /// The string's text; never null, even for storage without a buffer.
 inline char const* ReadPtr(String const& s) {
@@ -26,12 +26,12 @@ inline char const* ReadPtr(String const& s) {
 inline int OffsetOfChar(char const* text, int textBytes, int charIndex, bool mb) {
     if (!mb)
         return std::clamp(charIndex, 0, textBytes);
-    return scan::ByteOffsetOfChar(text, charIndex, true);
+    return detail::ByteOffsetOfChar(text, charIndex, true);
 }
 
 /// Character index of byte offset `offset` (a character boundary) of `text`.
 inline int IndexOfOffset(char const* text, int offset, bool mb) {
-    return mb ? scan::CharIndexOfByte(text, offset, true) : offset;
+    return mb ? detail::CharIndexOfByte(text, offset, true) : offset;
 }
 
 /// What to look for.
@@ -54,4 +54,4 @@ int FindNext(char const* text, int textBytes, int from, Needle const& needle, bo
 /// True when `ch` is one of the characters of `set` (null: white space).
 bool IsInSet(unsigned short ch, char const* set, bool mb);
 
-} // namespace tekit::search
+} // namespace tekit::detail

@@ -6,7 +6,7 @@
 #include <cstring>
 #include <cwchar>
 
-namespace tekit::wide {
+namespace tekit::detail {
 
 namespace {
 
@@ -159,4 +159,4 @@ std::string WideToUtf8(wchar_t const* text, int numChars) {
     return out;
 }
 
-} // namespace tekit::wide
+} // namespace tekit::detail

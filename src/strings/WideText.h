@@ -8,7 +8,7 @@
 
 #include <string>
 
-namespace tekit::wide {
+namespace tekit::detail {
 
 /// `numBytes` of narrow text (negative: to the terminator) as wide text.
 std::wstring ToWide(char const* text, int numBytes);
@@ -21,4 +21,4 @@ std::wstring Utf8ToWide(char const* utf8, int numBytes);
 /// Wide text as UTF-8; unpaired surrogates become U+FFFD.
 std::string WideToUtf8(wchar_t const* text, int numChars);
 
-} // namespace tekit::wide
+} // namespace tekit::detail
