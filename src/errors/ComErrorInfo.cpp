@@ -46,9 +46,8 @@ void CheckHrIErrorInfo(long hr, char const* function, char const* file) {
     std::string description;
     platform::GetThreadErrorInfo(source, description);
     // A caller that names its file cannot give its line: the line is then 0, not ours.
-    RaiseTEException(description.c_str(), function, ToTEError(code), false, nullptr,
-                     long(std::int32_t(code)), source.c_str(), file ? file : TE_FILE_BASE_NAME,
-                     file ? 0 : __LINE__, __DATE__, __TIME__);
+    TE_RAISE_FROM(ToTEError(code), description.c_str(), function, long(std::int32_t(code)),
+                  source.c_str(), file, 0);
 }
 
 } // namespace tekit

@@ -69,7 +69,7 @@ std::uint64_t PathBase::GetFileSize() const {
 
 std::uint64_t PathBase::GetFileTime(FileTimeOptions which) const {
     if (which < kCreationTime || which > kLastWriteTime)
-        TE_PATH_ASSERTION("invalid FileTimeOptions", "PathBase::GetFileTime");
+        TE_RAISE_ASSERTION("invalid FileTimeOptions", "PathBase::GetFileTime");
     platform::FileInfo info;
     FileError error;
     if (!platform::QueryFile(CStr(), info, error))
@@ -80,7 +80,7 @@ std::uint64_t PathBase::GetFileTime(FileTimeOptions which) const {
 
 void PathBase::SetFileTime(FileTimeOptions which, std::uint64_t fileTime) const {
     if (which < kCreationTime || which > kLastWriteTime)
-        TE_PATH_ASSERTION("invalid FileTimeOptions", "PathBase::SetFileTime");
+        TE_RAISE_ASSERTION("invalid FileTimeOptions", "PathBase::SetFileTime");
     FileError error;
     if (!platform::SetFileTimeValue(CStr(), which, fileTime, error))
         TE_RAISE_FILE_ERROR(error, Describe("PATH_CANT_CHANGE_1_2", error, CStr()),

@@ -108,7 +108,7 @@ bool Contains(String const& directory, PathBase const& path, bool anyDepth,
 int PathBase::GetTopLevel() const {
     int top = 0;
     if (!FindTopLevel(ToChars(GetPathString()), top))
-        TE_PATH_ASSERTION("invalid UNC path", "PathBase::GetTopLevel");
+        TE_RAISE_ASSERTION("invalid UNC path", "PathBase::GetTopLevel");
     return top;
 }
 

@@ -54,7 +54,7 @@ PathChars detail::Shorten(PathChars const& chars, int top, int headEnd,
                           std::function<bool(PathChars const&)> const& fits) {
     PathShape const shape = ShapeOf(chars, "PathBase::GetAbbreviatedName");
     if (shape.levels.empty())
-        TE_PATH_ASSERTION("Missing path components??", "PathBase::GetAbbreviatedName");
+        TE_RAISE_ASSERTION("Missing path components??", "PathBase::GetAbbreviatedName");
     std::vector<PathChars> const forms = Shortenings(chars, shape, top, headEnd);
     for (PathChars const& form : forms)
         if (fits(form))

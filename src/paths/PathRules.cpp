@@ -142,7 +142,7 @@ bool FindTopLevel(PathChars const& chars, int& top) {
 PathShape ShapeOf(PathChars const& chars, char const* function) {
     PathShape shape;
     if (!FindTopLevel(chars, shape.top))
-        TE_PATH_ASSERTION("invalid UNC path", function);
+        TE_RAISE_ASSERTION("invalid UNC path", function);
     int const n = Size(chars);
     shape.rootEnd = UsesDriveLetter(chars) ? std::min(3, n) : shape.top;
     int begin = shape.rootEnd;

@@ -66,8 +66,3 @@ PathChars RootOf(PathChars const& chars, PathShape const& shape);
 bool LevelsEqual(PathChars const& a, Level const& i, PathChars const& b, Level const& j);
 
 } // namespace tekit::detail
-
-/// Raises a TE_PROGRAM_ERROR assertion with `text` from the calling site.
-#define TE_PATH_ASSERTION(text, function)                                                          \
-    ::tekit::RaiseTEAssertion((text), (function), ::tekit::TE_PROGRAM_ERROR, false, nullptr, 0,    \
-                              nullptr, TE_FILE_BASE_NAME, __LINE__, __DATE__, __TIME__)

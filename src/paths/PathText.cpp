@@ -70,7 +70,7 @@ bool PathBase::IsCmdFileExtension(String const& extension) {
 
 void PathBase::GetCmdFileExtension(long index, String& extension) {
     if (index < 0 || index >= kNumCmdFileExtensions)
-        TE_PATH_ASSERTION("invalid index to GetCmdFileExtension", "PathBase::GetCmdFileExtension");
+        TE_RAISE_ASSERTION("invalid index to GetCmdFileExtension", "PathBase::GetCmdFileExtension");
     extension.Assign(kCmdFileExtensions[index]);
 }
 

@@ -246,8 +246,7 @@ void String::Unscramble() {
 // ---- Assertions and orderings ---------------------------------------------------------
 
 void String::ThrowStringAssertion(char const* condition, char const* function) {
-    RaiseTEAssertion(condition ? condition : "", function ? function : "", TE_PROGRAM_ERROR, false,
-                     nullptr, 0, nullptr, TE_FILE_BASE_NAME, __LINE__, __DATE__, __TIME__);
+    TE_RAISE_ASSERTION(condition ? condition : "", function ? function : "");
 }
 
 bool StringPtrLessThan::operator()(String const* a, String const* b) const {

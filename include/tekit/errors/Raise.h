@@ -94,6 +94,16 @@ template <unsigned N> struct SourceBaseName {
     ::tekit::RaiseTEException((description), (function), (code), false, (apiFunction),             \
                               (apiErrorCode), nullptr, TE_FILE_BASE_NAME, __LINE__, __DATE__,      \
                               __TIME__)
+/// Raises with an error source (a COM component's name) and the place the caller names: a
+/// `file` of null is the calling file and `line` then the calling line.
+#define TE_RAISE_FROM(code, description, function, apiErrorCode, errorSource, file, line)          \
+    ::tekit::RaiseTEException((description), (function), (code), false, nullptr, (apiErrorCode),   \
+                              (errorSource), (file) ? (file) : TE_FILE_BASE_NAME,                  \
+                              (file) ? (line) : __LINE__, __DATE__, __TIME__)
+/// Raises TE_PROGRAM_ERROR with `text` as the assertion text.
+#define TE_RAISE_ASSERTION(text, function)                                                         \
+    ::tekit::RaiseTEAssertion((text), (function), ::tekit::TE_PROGRAM_ERROR, false, nullptr, 0,    \
+                              nullptr, TE_FILE_BASE_NAME, __LINE__, __DATE__, __TIME__)
 /// Raises TE_PROGRAM_ERROR with the failed condition as the assertion text.
 #define TE_ASSERT(condition, function)                                                             \
     do {                                                                                           \
