@@ -1,3 +1,5 @@
+// COM error information: publishing a TEException to COM clients and raising from a failed
+// HRESULT with the error information the callee left.
 #include "tekit/errors/ComErrorInfo.h"
 
 #include "platform/Platform.h"

@@ -1,3 +1,4 @@
+// The debug-output sink: one replaceable writer of diagnostic text, guarded across threads.
 #include "tekit/errors/DebugOutput.h"
 
 #include "platform/Platform.h"

@@ -1,3 +1,4 @@
+// The process-wide diagnostic level, read once from TEKIT_DIAGNOSTIC_LEVEL and settable.
 #include "tekit/errors/DiagnosticLevel.h"
 
 #include "platform/Platform.h"

@@ -1,3 +1,4 @@
+// Lookup strings: property names joined with ".".
 #include "tekit/errors/LookupString.h"
 
 namespace tekit {

@@ -1,3 +1,4 @@
+// The built-in message catalogue: the sections the global message table starts with.
 #include "errors/MessageCatalogue.h"
 
 #include "tekit/errors/StatusDefinitions.h"

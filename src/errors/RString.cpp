@@ -1,3 +1,4 @@
+// RString and the global message table: texts by section and key, built-in or set at run time.
 #include "tekit/errors/RString.h"
 
 #include "errors/MessageCatalogue.h"

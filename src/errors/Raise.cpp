@@ -1,3 +1,4 @@
+// The raise, assertion and warning functions behind the TE_RAISE family of macros.
 #include "tekit/errors/Raise.h"
 
 #include "errors/Warning.h"

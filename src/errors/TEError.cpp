@@ -1,3 +1,4 @@
+// The error table and the conversions from Win32 codes, HRESULTs and errno values to TEError.
 #include "tekit/errors/TEError.h"
 
 #include <cstring>

@@ -1,3 +1,4 @@
+// TEException: the library's one exception type, its fields, reporting and COM translation.
 #include "tekit/errors/TEException.h"
 
 #include "errors/Warning.h"

@@ -1,3 +1,5 @@
+// The three-line warning form written to the debug output by warnings and by the
+// destructor-exception handler.
 #include "errors/Warning.h"
 
 #include "tekit/errors/DebugOutput.h"

@@ -1,3 +1,5 @@
+// Path texts as character lists: double-byte characters kept whole, so the path rules work
+// on characters, never on half a character.
 #include "paths/PathChars.h"
 
 #include "strings/MultiByte.h"

@@ -1,3 +1,4 @@
+// The path rules on character lists: roots, levels, validation and their messages.
 #include "paths/PathRules.h"
 
 #include "tekit/paths/PathBase.h"

@@ -1,3 +1,4 @@
+// BufferString: a string over a caller's fixed buffer, truncating at its capacity.
 #include "tekit/strings/BufferString.h"
 
 #include "strings/MultiByte.h"

@@ -1,3 +1,4 @@
+// DynamicString: heap text over a shared copy-on-write block.
 #include "tekit/strings/DynamicString.h"
 
 #include "tekit/strings/CopyOnWriteMemory.h"

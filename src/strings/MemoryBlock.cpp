@@ -1,3 +1,4 @@
+// MemoryBlock: a plain owned byte buffer for raw scratch memory.
 #include "tekit/strings/MemoryBlock.h"
 
 namespace tekit {

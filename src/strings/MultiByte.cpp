@@ -1,3 +1,4 @@
+// The multibyte character operations over the process-wide lead-byte table.
 #include "strings/MultiByte.h"
 
 #include "platform/Platform.h"

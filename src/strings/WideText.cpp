@@ -1,3 +1,4 @@
+// Narrow text to wide and UTF-8 text and back; UTF-8 by portable code.
 #include "strings/WideText.h"
 
 #include "platform/Platform.h"
