@@ -17,18 +17,6 @@ if(TARGET tekit_cli)
   install(TARGETS tekit_cli RUNTIME DESTINATION ${CMAKE_INSTALL_BINDIR})
 endif()
 
-# The compression module is loaded at run time from the library's own folder, so it goes
-# where the library goes: bin/ beside tekit.dll, lib/ beside libtekit.so.
-if(TARGET kazlibwapi)
-  if(WIN32)
-    set(_tekit_module_dir ${CMAKE_INSTALL_BINDIR})
-  else()
-    set(_tekit_module_dir ${CMAKE_INSTALL_LIBDIR})
-  endif()
-  install(TARGETS kazlibwapi LIBRARY DESTINATION ${_tekit_module_dir}
-          RUNTIME DESTINATION ${_tekit_module_dir})
-endif()
-
 # ---- CMake package ----------------------------------------------------------------------
 install(EXPORT tekitTargets NAMESPACE tekit:: DESTINATION ${TEKIT_INSTALL_CMAKEDIR}
         FILE tekitTargets.cmake)
