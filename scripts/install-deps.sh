@@ -10,7 +10,7 @@
 set -euo pipefail
 
 linux_packages=(cmake ninja-build g++ pkg-config libgtest-dev googletest libbenchmark-dev
-                libcli11-dev zlib1g-dev clang locales)
+                zlib1g-dev clang locales)
 # binutils for both MinGW targets: the i686 leg checks its DLL's export table with objdump.
 windows_packages=(g++-mingw-w64-x86-64-posix g++-mingw-w64-i686-posix wine wine64
                   libz-mingw-w64-dev xvfb binutils-mingw-w64-x86-64 binutils-mingw-w64-i686)

@@ -53,10 +53,10 @@ TEST(Record, PrintsAlignedNameValueLines) {
     EXPECT_EQ(out.str(), "  code     x\n  comCode  y\n  found    yes\n");
 }
 
-TEST(PrintTable, PadsEveryColumnButTheLast) {
+TEST(PrintTable, PadsEveryColumnButTheLastAndEndsNoLineInBlanks) {
     std::ostringstream out;
-    PrintTable(out, {{"A", "long cell", "end"}, {"wider", "b"}, {}});
-    EXPECT_EQ(out.str(), "A      long cell  end\nwider  b\n\n");
+    PrintTable(out, {{"A", "long cell", "end"}, {"wider", "b"}, {}, {"x", ""}});
+    EXPECT_EQ(out.str(), "A      long cell  end\nwider  b\n\nx\n");
     std::ostringstream negativeIndent;
     PrintTable(negativeIndent, {{"x"}}, -3);
     EXPECT_EQ(negativeIndent.str(), "x\n");
@@ -65,4 +65,41 @@ TEST(PrintTable, PadsEveryColumnButTheLast) {
 TEST(JsonArray, PutsOneElementPerLine) {
     EXPECT_EQ(JsonArray({}), "[]");
     EXPECT_EQ(JsonArray({"1", "{}"}), "[\n  1,\n  {}\n]");
+}
+
+TEST(Shown, WritesControlBytesAsHexAndKeepsTheRest) {
+    struct {
+        std::string_view text, shown;
+    } const cases[] = {
+        {"C:\\a\\b.txt", "C:\\a\\b.txt"},
+        {"a\nb", "a<0x0A>b"},
+        {"\t\r", "<0x09><0x0D>"},
+        {std::string_view("\0x", 2), "<0x00>x"},
+        {"\x1F\x7F", "<0x1F><0x7F>"},
+        {"caf\xC3\xA9 \x93\xFA", "caf\xC3\xA9 \x93\xFA"}, // high bytes are no control bytes
+    };
+    for (auto const& c : cases)
+        EXPECT_EQ(Shown(c.text), c.shown) << c.shown;
+}
+
+TEST(CharacterName, NamesWhitespaceControlAndPrintableBytes) {
+    EXPECT_EQ(CharacterName('\n'), "line feed (0x0A)");
+    EXPECT_EQ(CharacterName('\r'), "carriage return (0x0D)");
+    EXPECT_EQ(CharacterName('\t'), "tab (0x09)");
+    EXPECT_EQ(CharacterName(0x01), "control character 0x01");
+    EXPECT_EQ(CharacterName(0x7F), "control character 0x7F");
+    EXPECT_EQ(CharacterName('<'), "\"<\" (0x3C)");
+}
+
+TEST(PrintRecords, SeparatesTextRecordsAndAlwaysWritesOneJsonArray) {
+    Record first, second;
+    first.AddText("path", "a\tb");
+    second.AddNumber("levels", 2);
+    std::ostringstream text, json, none;
+    PrintRecords(text, {first, second}, false);
+    PrintRecords(json, {first}, true);
+    PrintRecords(none, {}, true);
+    EXPECT_EQ(text.str(), "path  a<0x09>b\n\nlevels  2\n");
+    EXPECT_EQ(json.str(), "[\n  {\"path\": \"a\\tb\"}\n]\n");
+    EXPECT_EQ(none.str(), "[]\n");
 }

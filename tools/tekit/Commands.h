@@ -1,42 +1,66 @@
-// The tool's commands. Each command lives in its own file and adds itself to the application
-// with one Add...Command function, so a new command is one new file and one line in main.cpp.
+// The tool's commands. Each command lives in its own file and describes itself with a Command
+// (name, help text, options, run function); main.cpp only looks the name up and runs it, so a
+// new command is one new file and one line in AllCommands().
 //
-//   CLI::App app;
-//   ToolContext context;
-//   AddErrorCommand(app, context);
+//   tekit path check 'C:\data\report.ini'   ->  Command "path check", arguments {"C:\..."}
 #pragma once
 
+#include <map>
 #include <stdexcept>
 #include <string>
-
-namespace CLI {
-class App;
-}
+#include <vector>
 
 namespace tekit::tool {
 
-/// Exit statuses: 0 success, 1 the command failed (message on standard error), 2 the command
-/// line was wrong.
+/// Exit statuses: 0 success; 1 a finding or a failure (explained on standard error); 2 the
+/// command line was wrong.
 enum ExitStatus { kSuccess = 0, kFailure = 1, kUsageError = 2 };
 
-/// Settings shared by every command.
-struct ToolContext {
-    /// Print JSON instead of text (the global --json flag or a command's own).
-    bool json = false;
-};
-
-/// A command that could not do what was asked: main prints "tekit: <what>" to standard error
-/// and exits with kFailure.
+/// A command that could not do what was asked at all: main prints "tekit: <what>" to
+/// standard error and exits with kFailure.
 class ToolError : public std::runtime_error {
 public:
     using std::runtime_error::runtime_error;
 };
 
-/// Adds --json to a command as well, so it may follow the command's own arguments.
-void AddJsonFlag(CLI::App& command, ToolContext& context);
+/// An option a command takes besides --json and --help. `valueName` is null for a flag.
+struct OptionSpec {
+    char const* name;
+    char const* valueName;
+};
 
-void AddErrorCommand(CLI::App& app, ToolContext& context);
-void AddDemoCommand(CLI::App& app, ToolContext& context);
-void AddPathCommand(CLI::App& app, ToolContext& context);
+/// A parsed command line, as a command's run function receives it.
+struct Invocation {
+    std::vector<std::string> arguments;
+    std::map<std::string, std::string> options;
+    bool json = false;
+
+    bool Has(std::string const& option) const { return options.count(option) != 0; }
+};
+
+struct Command {
+    /// "error", or "path check" for a command of a group.
+    char const* name;
+    /// One line, shown in the list of commands.
+    char const* summary;
+    /// The usage line without "Usage: ".
+    char const* usage;
+    /// The rest of the help: what it does, options, examples, exit status.
+    char const* details;
+    std::vector<OptionSpec> options;
+    int (*run)(Invocation const&);
+};
+
+std::vector<Command> const& DemoCommands();
+std::vector<Command> const& ErrorCommands();
+std::vector<Command> const& PathCommands();
+
+/// A word that gathers commands ("path" for "path check", ...): its own help.
+struct CommandGroup {
+    char const* name;
+    char const* summary;
+    char const* details;
+};
+CommandGroup const& PathGroup();
 
 } // namespace tekit::tool

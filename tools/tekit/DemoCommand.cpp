@@ -1,4 +1,5 @@
 // tekit demo: a short tour of what the library does, each result computed as it is shown.
+#include "Arguments.h"
 #include "Commands.h"
 #include "Output.h"
 
@@ -11,8 +12,6 @@
 #include "tekit/strings/DynamicString.h"
 #include "tekit/strings/MultiByte.h"
 #include "tekit/strings/StaticString.h"
-
-#include <CLI/CLI.hpp>
 
 #include <algorithm>
 #include <iostream>
@@ -193,15 +192,17 @@ std::string SectionJson(Section const& section) {
     return Record().AddText("title", section.title).AddJson("steps", stepsJson + "]", "").ToJson();
 }
 
-void RunDemo(ToolContext const& context) {
+int RunDemo(Invocation const& call) {
+    if (!call.arguments.empty())
+        throw UsageError("demo takes no arguments, not " + Quote(call.arguments[0]), "demo");
     std::vector<Section> const sections{CopyOnWrite(),   Truncation(),    MultiByte(),
                                         RaiseAndCatch(), MessageLookup(), PathChecks()};
-    if (context.json) {
+    if (call.json) {
         std::vector<std::string> json;
         for (Section const& section : sections)
             json.push_back(SectionJson(section));
         std::cout << JsonArray(json) << '\n';
-        return;
+        return kSuccess;
     }
     std::cout << "tekit " TEKIT_VERSION_TEXT ": what the library does so far\n";
     for (Section const& section : sections) {
@@ -211,14 +212,39 @@ void RunDemo(ToolContext const& context) {
             rows.push_back({step.action, step.result});
         PrintTable(std::cout, rows, 2);
     }
+    return kSuccess;
 }
+
+char const kDetails[] =
+    R"(Walks through what the library does so far - strings, errors, paths - and computes every
+result as it is shown, so a fault in the library shows up here.
+
+Options:
+  --json      Print JSON: an array of sections, each with its steps
+  -h, --help  Print this help
+
+Examples:
+  tekit demo
+  tekit demo --json | python3 -m json.tool
+
+Exit status:
+  0  the demo ran
+  1  it could not finish (why: on standard error)
+  2  the command line was wrong
+)";
 
 } // namespace
 
-void AddDemoCommand(CLI::App& app, ToolContext& context) {
-    CLI::App* command = app.add_subcommand("demo", "Show what the library does, step by step");
-    AddJsonFlag(*command, context);
-    command->callback([&context] { RunDemo(context); });
+std::vector<Command> const& DemoCommands() {
+    static std::vector<Command> const commands{
+        {"demo",
+         "Show what the library does, step by step",
+         "tekit demo [--json]",
+         kDetails,
+         {},
+         RunDemo},
+    };
+    return commands;
 }
 
 } // namespace tekit::tool

@@ -91,8 +91,29 @@ std::string HexCode(std::uint32_t value) {
     return text;
 }
 
+std::string Shown(std::string_view text) {
+    std::string out;
+    for (char const c : text) {
+        auto const byte = static_cast<unsigned char>(c);
+        out += byte < 0x20 || byte == 0x7F ? "<" + HexCode(byte).replace(2, 6, "") + ">"
+                                           : std::string(1, c);
+    }
+    return out;
+}
+
+std::string CharacterName(unsigned char byte) {
+    static char const* const kNames[] = {"tab", "line feed", "vertical tab", "form feed",
+                                         "carriage return"};
+    std::string const code = HexCode(byte).replace(2, 6, "");
+    if (byte >= 0x09 && byte <= 0x0D)
+        return std::string(kNames[byte - 0x09]) + " (" + code + ")";
+    if (byte < 0x20 || byte == 0x7F)
+        return "control character " + code;
+    return "\"" + std::string(1, static_cast<char>(byte)) + "\" (" + code + ")";
+}
+
 Record& Record::AddText(std::string name, std::string_view text) {
-    m_fields.push_back({std::move(name), std::string(text), JsonQuote(text)});
+    m_fields.push_back({std::move(name), Shown(text), JsonQuote(text)});
     return *this;
 }
 
@@ -135,6 +156,20 @@ std::string JsonArray(std::vector<std::string> const& elements) {
     return out + "]";
 }
 
+void PrintRecords(std::ostream& out, std::vector<Record> const& records, bool json) {
+    if (json) {
+        std::vector<std::string> elements;
+        for (Record const& record : records)
+            elements.push_back(record.ToJson());
+        out << JsonArray(elements) << '\n';
+        return;
+    }
+    for (size_t i = 0; i < records.size(); ++i) {
+        out << (i ? "\n" : "");
+        records[i].PrintText(out);
+    }
+}
+
 void PrintTable(std::ostream& out, std::vector<std::vector<std::string>> const& rows, int indent) {
     std::vector<size_t> widths;
     for (auto const& row : rows)
@@ -150,6 +185,7 @@ void PrintTable(std::ostream& out, std::vector<std::vector<std::string>> const& 
             if (column + 1 < row.size())
                 line += std::string(widths[column] - row[column].size() + 2, ' ');
         }
+        line.erase(line.find_last_not_of(' ') + 1); // an empty last cell leaves no blanks
         out << line << '\n';
     }
 }

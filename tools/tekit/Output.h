@@ -22,9 +22,17 @@ std::string JsonQuote(std::string_view text);
 /// A 32-bit code as eight upper-case hex digits: "0x80004005", "0x00000002".
 std::string HexCode(std::uint32_t value);
 
+/// `text` for a terminal: each control byte (0x00-0x1F, 0x7F) written as <0x0A>, so a path
+/// that holds one stays on its own line and the byte can be seen. '<' is no path character.
+std::string Shown(std::string_view text);
+
+/// A byte's name for messages: "line feed (0x0A)", "tab (0x09)", "\"<\" (0x3C)".
+std::string CharacterName(unsigned char byte);
+
 /// Named values in a fixed order, printed as aligned "name  value" lines or as a JSON object.
 class Record {
 public:
+    /// Text values are Shown() in text output and JSON-quoted in JSON.
     Record& AddText(std::string name, std::string_view text);
     Record& AddNumber(std::string name, long long value);
     Record& AddBool(std::string name, bool value);
@@ -46,6 +54,10 @@ private:
 
 /// JSON array of already-formatted elements, one element per line.
 std::string JsonArray(std::vector<std::string> const& elements);
+
+/// One record per input: as text, records separated by a blank line; as JSON, one array
+/// (also for a single record, so a script sees the same shape whatever the input count).
+void PrintRecords(std::ostream& out, std::vector<Record> const& records, bool json);
 
 /// Rows of cells in left-aligned columns separated by two spaces; the last column is not
 /// padded, so no line ends in blanks.
