@@ -1,6 +1,6 @@
 #include "tekit/errors/DebugOutput.h"
 
-#include "DebugCapture.h"
+#include "support/DebugCapture.h"
 
 #include <gtest/gtest.h>
 

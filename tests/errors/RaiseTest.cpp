@@ -1,7 +1,7 @@
 #include "tekit/errors/Raise.h"
 
-#include "DebugCapture.h"
-#include "tekit/errors/TEException.h"
+#include "support/DebugCapture.h"
+#include "support/Raises.h"
 
 #include <gtest/gtest.h>
 
@@ -13,19 +13,9 @@
 using namespace tekit;
 using tekit::testing::DebugCapture;
 using tekit::testing::DiagnosticLevelScope;
+using tekit::testing::Raised;
 
 namespace {
-
-/// The exception that `raise` throws; fails the test when it throws nothing.
-TEException Caught(std::function<void()> const& raise) {
-    try {
-        raise();
-    } catch (TEException const& e) {
-        return e;
-    }
-    ADD_FAILURE() << "nothing was raised";
-    return TEException();
-}
 
 class Raising : public ::testing::Test {
 protected:
@@ -36,7 +26,7 @@ protected:
 
 TEST_F(Raising, MacroRecordsTheSitesFileLineAndBuildStamp) {
     long line = 0;
-    TEException const e = Caught([&] {
+    TEException const e = Raised([&] {
         line = __LINE__ + 1;
         TE_RAISE(TE_INDEX_OUT_OF_RANGE, "Index 7 is past the end", "OVMemoryStream::Seek");
     });
@@ -55,14 +45,14 @@ TEST_F(Raising, MacroRecordsTheSitesFileLineAndBuildStamp) {
         << e.GetCompilationTime();
 
     TEException const api =
-        Caught([] { TE_RAISE_API(TE_IO_ERROR, nullptr, "OVBinaryFileStream::Read", "read", 5); });
+        Raised([] { TE_RAISE_API(TE_IO_ERROR, nullptr, "OVBinaryFileStream::Read", "read", 5); });
     EXPECT_STREQ(api.GetAPIFunctionName(), "read");
     EXPECT_EQ(api.GetAPIErrorCode(), 5);
     EXPECT_STREQ(api.GetDescription(), "File input/output error.");
 }
 
 TEST_F(Raising, AssertionKeepsItsTextOnlyAboveDiagnosticLevelZero) {
-    auto const assertion = [] {
+    auto const fromText = [] {
         RaiseTEAssertion("index < size", "Cache::Get", TE_PROGRAM_ERROR, false, nullptr, 0, nullptr,
                          "Cache", 42, "Jan  1 2024", "00:00:00");
     };
@@ -70,29 +60,21 @@ TEST_F(Raising, AssertionKeepsItsTextOnlyAboveDiagnosticLevelZero) {
         RaiseTEAssertion(DynamicString("index < size", true), "Cache::Get", TE_PROGRAM_ERROR, false,
                          nullptr, 0, nullptr, "Cache", 42, "Jan  1 2024", "00:00:00");
     };
-    {
-        DiagnosticLevelScope level(0);
-        EXPECT_STREQ(Caught(assertion).GetDescription(), "Program error.");
-        EXPECT_STREQ(Caught(fromString).GetDescription(), "Program error.");
-        TEException const e = Caught([] { TE_ASSERT(1 == 2, "Cache::Get"); });
-        EXPECT_STREQ(e.GetDescription(), "Program error.");
-        EXPECT_STREQ(e.GetFunctionName(), "Cache::Get");
-        EXPECT_STREQ(e.GetFileName(), "RaiseTest");
+    for (int level : {0, 1}) {
+        DiagnosticLevelScope scope(level);
+        char const* const text = level > 0 ? "index < size" : "Program error.";
+        EXPECT_RAISES_IN(fromText(), TE_PROGRAM_ERROR, "Cache::Get", text);
+        EXPECT_RAISES_IN(fromString(), TE_PROGRAM_ERROR, "Cache::Get", text);
+        EXPECT_RAISES_IN(TE_ASSERT(1 == 2, "Cache::Get"), TE_PROGRAM_ERROR, "Cache::Get",
+                         level > 0 ? "Assertion failed: 1 == 2" : "Program error.");
     }
-    {
-        DiagnosticLevelScope level(1);
-        TEException const e = Caught(assertion);
-        EXPECT_STREQ(e.GetDescription(), "index < size");
-        EXPECT_EQ(e.GetLine(), 42);
-        EXPECT_STREQ(Caught(fromString).GetDescription(), "index < size");
-        EXPECT_STREQ(Caught([] { TE_ASSERT(1 == 2, "Cache::Get"); }).GetDescription(),
-                     "Assertion failed: 1 == 2");
-    }
+    EXPECT_EQ(Raised(fromText).GetLine(), 42);
+    EXPECT_STREQ(Raised([] { TE_ASSERT(false, "Cache::Get"); }).GetFileName(), "RaiseTest");
 }
 
 TEST_F(Raising, SystemErrorsBecomeTheirTEErrorWithTheSystemsText) {
     TEException const denied =
-        Caught([] { RaiseTESystemException(5, "Registry", 17, "Jan  1 2024", "00:00:00"); });
+        Raised([] { RaiseTESystemException(5, "Registry", 17, "Jan  1 2024", "00:00:00"); });
     EXPECT_EQ(denied.GetErrorCode(), TE_ACCESS_DENIED);
     EXPECT_EQ(denied.GetAPIErrorCode(), 5);
     EXPECT_STREQ(denied.GetAPIFunctionName(), "");
@@ -100,7 +82,7 @@ TEST_F(Raising, SystemErrorsBecomeTheirTEErrorWithTheSystemsText) {
     EXPECT_EQ(denied.GetLine(), 17);
     EXPECT_GT(std::string(denied.GetDescription()).size(), 0u);
 
-    TEException const other = Caught(
+    TEException const other = Raised(
         [] { RaiseTESystemException(0x8000FFFFu, "Registry", 18, "Jan  1 2024", "00:00:00"); });
     EXPECT_EQ(other.GetErrorCode(), TE_OS_EXCEPTION);
     EXPECT_EQ(other.GetAPIErrorCode(), std::int32_t(0x8000FFFFu));
@@ -108,31 +90,18 @@ TEST_F(Raising, SystemErrorsBecomeTheirTEErrorWithTheSystemsText) {
 }
 
 TEST_F(Raising, ThrowHelpersRaiseTheirCodeWithTheCodesMessage) {
-    TEException const error = Caught([] { ThrowTEError(TE_DISK_FULL); });
-    EXPECT_EQ(error.GetErrorCode(), TE_DISK_FULL);
-    EXPECT_STREQ(error.GetDescription(), "The disk is full.");
-    EXPECT_STREQ(error.GetFunctionName(), "ThrowTEError");
-
-    TEException const memory = Caught([] { ThrowOutOfMemory(); });
-    EXPECT_EQ(memory.GetErrorCode(), TE_OUT_OF_MEMORY);
-    EXPECT_STREQ(memory.GetDescription(), "Out of memory.");
-    EXPECT_STREQ(memory.GetFunctionName(), "ThrowOutOfMemory");
-}
-
-TEST_F(Raising, SizeOverflowNamesTheSignednessOfTheLimit) {
-    TEException const unsignedLimit = Caught(
+    EXPECT_RAISES_IN(ThrowTEError(TE_DISK_FULL), TE_DISK_FULL, "ThrowTEError", "The disk is full.");
+    EXPECT_RAISES_IN(ThrowOutOfMemory(), TE_OUT_OF_MEMORY, "ThrowOutOfMemory", "Out of memory.");
+    // The size limit names its signedness by its code.
+    TEException const unsignedLimit = Raised(
         [] { Throw32BitOverflowException("OVMemoryStream::Grow", "MemoryStream", 88, false); });
     EXPECT_EQ(unsignedLimit.GetErrorCode(), TE_UINT32_OVERFLOW);
-    EXPECT_EQ(unsignedLimit.GetErrorCode(), -17011);
     EXPECT_STREQ(unsignedLimit.GetDescription(), "32-BIT SIZE LIMITATION.");
     EXPECT_STREQ(unsignedLimit.GetFunctionName(), "OVMemoryStream::Grow");
     EXPECT_STREQ(unsignedLimit.GetFileName(), "MemoryStream");
     EXPECT_EQ(unsignedLimit.GetLine(), 88);
-
-    TEException const signedLimit =
-        Caught([] { Throw32BitOverflowException("f", "file", 1, true); });
-    EXPECT_EQ(signedLimit.GetErrorCode(), -17010);
-    EXPECT_STREQ(signedLimit.GetDescription(), "32-BIT SIZE LIMITATION.");
+    EXPECT_RAISES_IN(Throw32BitOverflowException("f", "file", 1, true), TE_INT32_OVERFLOW, "f",
+                     "32-BIT SIZE LIMITATION.");
 }
 
 TEST(Warnings, AreWrittenInTwoOrThreeLinesAboveLevelZeroOnly) {

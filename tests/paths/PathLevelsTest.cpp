@@ -1,7 +1,9 @@
 #include "PathTestSupport.h"
+#include "support/Raises.h"
 #include "tekit/paths/Path.h"
 
 #include <string>
+#include <utility>
 
 using namespace tekit;
 using tekit::testing::TextOf;
@@ -34,22 +36,26 @@ std::string UpTo(char const* text, long count) {
 } // namespace
 
 TEST(PathLevels, LevelsFollowTheRootAndATrailingSeparatorAddsNone) {
-    EXPECT_EQ(Path("").GetNumLevels(), 0);
-    EXPECT_EQ(Path("C:\\").GetNumLevels(), 0);
-    EXPECT_EQ(Path("C:\\a").GetNumLevels(), 1);
-    EXPECT_EQ(Path("C:\\a\\").GetNumLevels(), 1);
-    EXPECT_EQ(Path("C:\\a\\b.txt").GetNumLevels(), 2);
-    EXPECT_EQ(Path("C:\\a\\\\b").GetNumLevels(), 3); // an empty level between
-    EXPECT_EQ(Path("a\\b").GetNumLevels(), 2);
-    EXPECT_EQ(Path("\\a").GetNumLevels(), 1);
-    EXPECT_EQ(Path("\\\\srv\\share").GetNumLevels(), 0);
-    EXPECT_EQ(Path("\\\\srv\\share\\d\\").GetNumLevels(), 1);
-
-    EXPECT_EQ(Path("C:\\a\\b").GetNumPathNameComponents(), 3);
-    EXPECT_EQ(Path("C:\\").GetNumPathNameComponents(), 1);
-    EXPECT_EQ(Path("a\\b").GetNumPathNameComponents(), 2);
-    EXPECT_EQ(Path("\\\\srv\\share\\a").GetNumPathNameComponents(), 2);
-    EXPECT_EQ(Path("").GetNumPathNameComponents(), 0);
+    // An empty level between two separators counts.
+    std::pair<char const*, int> const levels[] = {
+        {"", 0},
+        {"C:\\", 0},
+        {"C:\\a", 1},
+        {"C:\\a\\", 1},
+        {"C:\\a\\b.txt", 2},
+        {"C:\\a\\\\b", 3},
+        {"a\\b", 2},
+        {"\\a", 1},
+        {"\\\\srv\\share", 0},
+        {"\\\\srv\\share\\d\\", 1},
+    };
+    for (auto const& [text, count] : levels)
+        EXPECT_EQ(Path(text).GetNumLevels(), count) << text;
+    std::pair<char const*, int> const components[] = {
+        {"C:\\a\\b", 3}, {"C:\\", 1}, {"a\\b", 2}, {"\\\\srv\\share\\a", 2}, {"", 0},
+    };
+    for (auto const& [text, count] : components)
+        EXPECT_EQ(Path(text).GetNumPathNameComponents(), count) << text;
 }
 
 TEST(PathLevels, LeadingComponentsCountTheRootAsOne) {
@@ -113,12 +119,16 @@ TEST(PathLevels, PrefixAndSuffixOfAnAbsolutePath) {
 }
 
 TEST(PathLevels, RootDirectoryIsADirectoryText) {
-    EXPECT_STREQ(Path("C:\\a\\b").GetRootDir().CStr(), "C:\\");
-    EXPECT_STREQ(Path("C:").GetRootDir().CStr(), "C:\\");
-    EXPECT_STREQ(Path("\\\\srv\\sh\\a").GetRootDir().CStr(), "\\\\srv\\sh\\");
-    EXPECT_STREQ(Path("\\\\srv\\sh").GetRootDir().CStr(), "\\\\srv\\sh\\");
-    EXPECT_STREQ(Path("\\a").GetRootDir().CStr(), "\\");
-    EXPECT_STREQ(Path("a\\b").GetRootDir().CStr(), "");
+    std::pair<char const*, char const*> const roots[] = {
+        {"C:\\a\\b", "C:\\"},
+        {"C:", "C:\\"},
+        {"\\\\srv\\sh\\a", "\\\\srv\\sh\\"},
+        {"\\\\srv\\sh", "\\\\srv\\sh\\"},
+        {"\\a", "\\"},
+        {"a\\b", ""},
+    };
+    for (auto const& [text, root] : roots)
+        EXPECT_STREQ(Path(text).GetRootDir().CStr(), root) << text;
 }
 
 TEST(PathLevels, CommonPrefixIsMadeOfWholeLevels) {
@@ -162,9 +172,9 @@ TEST(PathLevels, DirectoryHoldsPathsAndLibraryEntries) {
 
 TEST(PathLevels, UncTextWithoutAShareHasNoLevels) {
     Path const machineOnly("\\\\srv");
-    tekit::testing::Caught([&] { machineOnly.GetNumLevels(); });
-    tekit::testing::Caught([&] { machineOnly.GetRootDir(); });
-    tekit::testing::Caught([&] { machineOnly.IsRootDirectory(); });
+    EXPECT_RAISES(machineOnly.GetNumLevels(), TE_PROGRAM_ERROR);
+    EXPECT_RAISES(machineOnly.GetRootDir(), TE_PROGRAM_ERROR);
+    EXPECT_RAISES(machineOnly.IsRootDirectory(), TE_PROGRAM_ERROR);
     EXPECT_STREQ(PathBase::FindCommonPrefix(Path("\\\\srv\\a\\b"), Path("\\\\srv\\a")).CStr(),
                  "\\\\srv\\a");
     EXPECT_FALSE(machineOnly.IsValid(false, nullptr)); // validation never raises

@@ -9,17 +9,6 @@ using namespace tekit;
 
 namespace {
 
-struct Collapsed {
-    std::string text;
-    bool resolved;
-};
-
-Collapsed Collapse(char const* text) {
-    Path path(text);
-    bool const resolved = path.CollapseDots();
-    return {path.CStr(), resolved};
-}
-
 void SetVariable(char const* name, char const* value) {
 #if defined(_WIN32)
     _putenv_s(name, value);
@@ -36,53 +25,36 @@ std::string Expanded(char const* text, bool keepUndefined) {
 
 } // namespace
 
-TEST(PathDots, SingleDotsGoAndDoubleDotsTakeTheLevelBefore) {
-    Collapsed c = Collapse("C:\\a\\.\\b\\..\\c");
-    EXPECT_EQ(c.text, "C:\\a\\c");
-    EXPECT_TRUE(c.resolved);
-    c = Collapse("C:\\a\\b\\..");
-    EXPECT_EQ(c.text, "C:\\a\\"); // each kept level keeps its own separator
-    c = Collapse("\\\\srv\\sh\\a\\..\\b\\.");
-    EXPECT_EQ(c.text, "\\\\srv\\sh\\b\\");
-    c = Collapse(".\\a");
-    EXPECT_EQ(c.text, "a");
-    c = Collapse("C:\\a\\b");
-    EXPECT_EQ(c.text, "C:\\a\\b");
-    EXPECT_TRUE(c.resolved);
-}
-
-TEST(PathDots, AnAbsolutePathDoesNotRiseAboveItsRoot) {
-    Collapsed c = Collapse("C:\\..");
-    EXPECT_EQ(c.text, "C:\\.."); // nothing dropped or resolved: left as it is
-    EXPECT_TRUE(c.resolved);
-    c = Collapse("C:\\..\\a");
-    EXPECT_EQ(c.text, "C:\\..\\a");
-    c = Collapse("C:\\a\\..\\..\\b");
-    EXPECT_EQ(c.text, "C:\\b"); // the second ".." is skipped once the text is rewritten
-    EXPECT_TRUE(c.resolved);
-}
-
-TEST(PathDots, UnresolvedDoubleDotsStayOnARelativePath) {
-    Collapsed c = Collapse("a\\..\\..\\b");
-    EXPECT_EQ(c.text, "..\\b");
-    EXPECT_FALSE(c.resolved);
-    c = Collapse("..\\x");
-    EXPECT_EQ(c.text, "..\\x");
-    EXPECT_FALSE(c.resolved);
-    // A kept ".." counts as a kept level: the next ".." takes it away.
-    c = Collapse("..\\..\\a");
-    EXPECT_EQ(c.text, "a");
-    EXPECT_FALSE(c.resolved);
-}
-
-TEST(PathDots, InvalidPathsAreLeftAlone) {
-    Collapsed c = Collapse("C:\\a\\\\..\\b");
-    EXPECT_EQ(c.text, "C:\\a\\\\..\\b");
-    EXPECT_TRUE(c.resolved);
-    c = Collapse("C:\\*\\..");
-    EXPECT_EQ(c.text, "C:\\*\\..");
-    c = Collapse("\\\\srv");
-    EXPECT_EQ(c.text, "\\\\srv");
+TEST(PathDots, CollapsingRemovesDotsWithoutRisingAboveTheRoot) {
+    struct Case {
+        char const* text;
+        char const* collapsed;
+        bool resolved;
+    } const cases[] = {
+        // Single dots go, double dots take the level before; kept levels keep their separator.
+        {"C:\\a\\.\\b\\..\\c", "C:\\a\\c", true},
+        {"C:\\a\\b\\..", "C:\\a\\", true},
+        {"\\\\srv\\sh\\a\\..\\b\\.", "\\\\srv\\sh\\b\\", true},
+        {".\\a", "a", true},
+        {"C:\\a\\b", "C:\\a\\b", true},
+        // An absolute path does not rise above its root: nothing dropped, left as it is.
+        {"C:\\..", "C:\\..", true},
+        {"C:\\..\\a", "C:\\..\\a", true},
+        {"C:\\a\\..\\..\\b", "C:\\b", true}, // the second ".." goes once the text is rewritten
+        // Unresolved double dots stay on a relative path; a kept ".." is a level to take away.
+        {"a\\..\\..\\b", "..\\b", false},
+        {"..\\x", "..\\x", false},
+        {"..\\..\\a", "a", false},
+        // Invalid paths are left alone.
+        {"C:\\a\\\\..\\b", "C:\\a\\\\..\\b", true},
+        {"C:\\*\\..", "C:\\*\\..", true},
+        {"\\\\srv", "\\\\srv", true},
+    };
+    for (Case const& c : cases) {
+        Path path(c.text);
+        EXPECT_EQ(path.CollapseDots(), c.resolved) << c.text;
+        EXPECT_STREQ(path.CStr(), c.collapsed) << c.text;
+    }
 }
 
 TEST(PathSeparators, RunsBecomeOneExceptTheUncOpening) {

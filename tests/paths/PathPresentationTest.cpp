@@ -1,9 +1,13 @@
 #include "PathTestSupport.h"
-#include "strings/MultiByteFixture.h"
+#include "support/MultiByteFixture.h"
 #include "tekit/paths/DynamicPath.h"
 #include "tekit/paths/Path.h"
 
 #include <string>
+
+#if TEKIT_HAS_OLE
+#include <comdef.h> // the _bstr_t cases
+#endif
 
 using namespace tekit;
 using tekit::testing::TextOf;

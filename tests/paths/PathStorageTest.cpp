@@ -1,5 +1,5 @@
 #include "PathTestSupport.h"
-#include "strings/MultiByteFixture.h"
+#include "support/MultiByteFixture.h"
 #include "tekit/paths/DynamicPath.h"
 #include "tekit/paths/Path.h"
 #include "tekit/paths/PathVector.h"

@@ -1,26 +1,23 @@
 // Helpers shared by the path tests.
 #pragma once
 
-#include "tekit/errors/TEException.h"
+#include "support/Raises.h"
 #include "tekit/paths/PathBase.h"
 #include "tekit/strings/DynamicString.h"
 
 #include <gtest/gtest.h>
 
 #include <functional>
+#include <source_location>
 #include <string>
+#include <utility>
 
 namespace tekit::testing {
 
-/// The exception that `raise` throws; fails the test when it throws nothing.
-inline TEException Caught(std::function<void()> const& raise) {
-    try {
-        raise();
-    } catch (TEException const& e) {
-        return e;
-    }
-    ADD_FAILURE() << "nothing was raised";
-    return TEException();
+/// The former name of Raised, for the path tests that still use it.
+template <class F>
+TEException Caught(F&& raise, std::source_location where = std::source_location::current()) {
+    return Raised(std::forward<F>(raise), where);
 }
 
 /// A path that stores its text exactly as given, without the normalisation of construction:

@@ -1,6 +1,7 @@
 #include "PathTestSupport.h"
-#include "errors/DebugCapture.h"
-#include "strings/MultiByteFixture.h"
+#include "support/DebugCapture.h"
+#include "support/MultiByteFixture.h"
+#include "support/Raises.h"
 #include "tekit/errors/RString.h"
 #include "tekit/paths/IsValidPath.h"
 #include "tekit/paths/Path.h"
@@ -8,7 +9,7 @@
 #include <string>
 
 using namespace tekit;
-using tekit::testing::Caught;
+using tekit::testing::Raised;
 using tekit::testing::RawPath;
 
 namespace {
@@ -139,34 +140,25 @@ TEST_F(PathValidity, ComponentAndNetworkNameChecks) {
 
 TEST_F(PathValidity, RaisingValidatorsCarryTheInvalidPathCodeAndTheirTexts) {
     Path const bad("C:\\a\\\\b");
-    TEException e = Caught([&] { bad.Validate(false); });
-    EXPECT_EQ(e.GetErrorCode(), TE_INVALID_PATHNAME);
-    EXPECT_EQ(e.GetErrorCode(), -17204);
-    EXPECT_STREQ(e.GetDescription(), kEmptyComponent);
-    EXPECT_STREQ(e.GetFunctionName(), "PathBase::Validate");
-    EXPECT_STREQ(e.GetFileName(), "Path");
-
-    e = Caught([&] { bad.ValidateEx(false); });
-    EXPECT_EQ(e.GetErrorCode(), TE_INVALID_PATHNAME);
-    EXPECT_EQ(std::string(e.GetDescription()),
-              std::string("Invalid path: 'C:\\a\\\\b'\n\n") + kEmptyComponent);
-
-    e = Caught([] { Path("dir\\f.txt").ValidateAbsolute(false); });
-    EXPECT_EQ(e.GetErrorCode(), TE_INVALID_PATHNAME);
-    EXPECT_STREQ(e.GetDescription(), "The path is not absolute: 'dir\\f.txt'");
-
-    e = Caught([] { Path("").ValidateAbsolute(false); }); // invalid before not absolute
-    EXPECT_EQ(std::string(e.GetDescription()), std::string("Invalid path: ''\n\n") + kEmpty);
+    EXPECT_RAISES_IN(bad.Validate(false), TE_INVALID_PATHNAME, "PathBase::Validate",
+                     kEmptyComponent);
+    EXPECT_STREQ(Raised([&] { bad.Validate(false); }).GetFileName(), "Path");
+    std::string const invalid = std::string("Invalid path: 'C:\\a\\\\b'\n\n") + kEmptyComponent;
+    EXPECT_RAISES_IN(bad.ValidateEx(false), TE_INVALID_PATHNAME, nullptr, invalid.c_str());
+    // A percent sign in the path is not taken for a placeholder.
+    std::string const percent =
+        std::string("Invalid path: 'C:\\100%1\\a\\\\b'\n\n") + kEmptyComponent;
+    EXPECT_RAISES_IN(Path("C:\\100%1\\a\\\\b").ValidateEx(false), TE_INVALID_PATHNAME, nullptr,
+                     percent.c_str());
+    EXPECT_RAISES_IN(Path("dir\\f.txt").ValidateAbsolute(false), TE_INVALID_PATHNAME, nullptr,
+                     "The path is not absolute: 'dir\\f.txt'");
+    std::string const empty = std::string("Invalid path: ''\n\n") + kEmpty;
+    EXPECT_RAISES_IN(Path("").ValidateAbsolute(false), TE_INVALID_PATHNAME, nullptr,
+                     empty.c_str()); // invalid before not absolute
 
     EXPECT_NO_THROW(Path("C:\\d\\*.txt").ValidateAbsolute(true));
     EXPECT_NO_THROW(Path("\\\\srv\\share\\f").ValidateAbsolute(false));
     EXPECT_NO_THROW(Path("dir\\f").Validate(false));
-}
-
-TEST_F(PathValidity, PercentInAPathIsNotTakenForAPlaceholder) {
-    TEException const e = Caught([] { Path("C:\\100%1\\a\\\\b").ValidateEx(false); });
-    EXPECT_EQ(std::string(e.GetDescription()),
-              std::string("Invalid path: 'C:\\100%1\\a\\\\b'\n\n") + kEmptyComponent);
 }
 
 TEST_F(PathValidity, FlatEntryPointRefusesLongTextWithoutParsing) {
@@ -198,14 +190,9 @@ TEST_F(PathValidityMultiByte, TrailByteThatEqualsABackslashIsNoSeparator) {
 
 TEST(PathAssertions, InternalErrorsRaiseTheProgramErrorWithTheirTextWhenDiagnosing) {
     tekit::testing::DiagnosticLevelScope const diagnosing(1);
-    TEException e = Caught([] { Path("\\\\srv").GetNumLevels(); });
-    EXPECT_EQ(e.GetErrorCode(), TE_PROGRAM_ERROR);
-    EXPECT_EQ(e.GetErrorCode(), -17001);
-    EXPECT_STREQ(e.GetDescription(), "invalid UNC path");
+    EXPECT_RAISES_IN(Path("\\\\srv").GetNumLevels(), TE_PROGRAM_ERROR, nullptr, "invalid UNC path");
     DynamicString extension;
-    e = Caught([&] { PathBase::GetCmdFileExtension(4, extension); });
-    EXPECT_EQ(e.GetErrorCode(), TE_PROGRAM_ERROR);
-    EXPECT_STREQ(e.GetDescription(), "invalid index to GetCmdFileExtension");
-    e = Caught([&] { PathBase::GetCmdFileExtension(-1, extension); });
-    EXPECT_EQ(e.GetErrorCode(), TE_PROGRAM_ERROR);
+    for (long index : {4L, -1L})
+        EXPECT_RAISES_IN(PathBase::GetCmdFileExtension(index, extension), TE_PROGRAM_ERROR, nullptr,
+                         "invalid index to GetCmdFileExtension");
 }

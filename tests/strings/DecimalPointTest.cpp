@@ -1,5 +1,6 @@
-#include "MultiByteFixture.h"
 #include "NumericTestSupport.h"
+#include "support/MultiByteFixture.h"
+#include "support/Raises.h"
 
 #include "tekit/strings/DecimalPoint.h"
 #include "tekit/strings/DynamicString.h"
@@ -8,11 +9,11 @@
 #include <gtest/gtest.h>
 
 #include <string>
+#include <utility>
 
 namespace tekit {
 namespace {
 
-using testing::Raised;
 using MultiByteDecimalPoint = testing::MultiByteFixture;
 
 std::string Trimmed(char const* text) {
@@ -22,7 +23,6 @@ std::string Trimmed(char const* text) {
 }
 
 TEST(DecimalPoint, ThePeriodOptionNeverChangesText) {
-    EXPECT_EQ(String::GetLocalizedDecimalPoint(kDecimalPoint_AlwaysPeriod), '.');
     EXPECT_EQ(String::GetLocalizedDecimalPoint(kDecimalPointLocalizationOptions(7)), '.');
     DecimalPointLocalizer const localizer(kDecimalPoint_AlwaysPeriod);
     EXPECT_FALSE(localizer.IsLocalizing());
@@ -33,16 +33,14 @@ TEST(DecimalPoint, ThePeriodOptionNeverChangesText) {
 }
 
 TEST(DecimalPoint, TrailingZerosOfTheFractionAreTrimmed) {
-    EXPECT_EQ(Trimmed("1.2500"), "1.25");
-    EXPECT_EQ(Trimmed("2.000"), "2");
-    EXPECT_EQ(Trimmed("1.2500e+03"), "1.25e+03");
-    EXPECT_EQ(Trimmed("3.e5"), "3e5");
-    EXPECT_EQ(Trimmed(".000"), "0");
-    EXPECT_EQ(Trimmed("-.0"), "-0");
-    EXPECT_EQ(Trimmed("100"), "100");
-    EXPECT_EQ(Trimmed("10.05 V"), "10.05 V");
-    EXPECT_EQ(Trimmed("Total: 7.50 V"), "Total: 7.5 V");
-    EXPECT_EQ(Trimmed(""), "");
+    std::pair<char const*, char const*> const cases[] = {
+        {"1.2500", "1.25"}, {"2.000", "2"},         {"1.2500e+03", "1.25e+03"},
+        {"3.e5", "3e5"},    {".000", "0"},          {"-.0", "-0"},
+        {"100", "100"},     {"10.05 V", "10.05 V"}, {"Total: 7.50 V", "Total: 7.5 V"},
+        {"", ""},
+    };
+    for (auto const& [text, trimmed] : cases)
+        EXPECT_EQ(Trimmed(text), trimmed) << text;
 
     StaticString<64> fixed("0.10");
     fixed.TrimTrailingZeros(kDecimalPoint_AlwaysPeriod);
@@ -104,12 +102,8 @@ TEST_F(CommaLocale, TheSystemSeparatorIsTheUsersNotTheProcesss) {
         EXPECT_EQ(String::GetLocalizedDecimalPoint(kDecimalPoint_AlwaysPeriod), '.');
         EXPECT_STREQ(setlocale(LC_NUMERIC, nullptr), "C"); // the process locale is untouched
     }
-    {
-        testing::ScopedUserNumericLocale const user("C");
-        EXPECT_EQ(String::GetLocalizedDecimalPoint(kDecimalPoint_UseSystemSeparator), '.');
-    }
-    {
-        testing::ScopedUserNumericLocale const user("no_SUCH.locale");
+    for (char const* period : {"C", "no_SUCH.locale"}) {
+        testing::ScopedUserNumericLocale const user(period);
         EXPECT_EQ(String::GetLocalizedDecimalPoint(kDecimalPoint_UseSystemSeparator), '.');
     }
     ASSERT_NE(setlocale(LC_NUMERIC, m_name.c_str()), nullptr);
@@ -130,12 +124,9 @@ TEST_F(CommaLocale, NumbersAreWrittenAndReadWithTheComma) {
     EXPECT_EQ(end, 3);
     EXPECT_EQ(s.CvtToFloat64(6, kDecimalPoint_UseSystemSeparator), 1e-7);
     // A period is no decimal point here, and a comma none with the period option.
-    EXPECT_EQ(Raised([] {
-                  DynamicString("1.5").CvtToFloat64(0, kDecimalPoint_UseSystemSeparator);
-              }).GetErrorCode(),
-              TE_UNRECOGNIZED_VALUE);
-    EXPECT_EQ(Raised([] { DynamicString("1,5").CvtToFloat64(); }).GetErrorCode(),
-              TE_UNRECOGNIZED_VALUE);
+    EXPECT_RAISES(DynamicString("1.5").CvtToFloat64(0, kDecimalPoint_UseSystemSeparator),
+                  TE_UNRECOGNIZED_VALUE);
+    EXPECT_RAISES(DynamicString("1,5").CvtToFloat64(), TE_UNRECOGNIZED_VALUE);
 
     DynamicString appended;
     appended.Append(0.25, kDecimalPoint_UseSystemSeparator, "%.1f");

@@ -3,7 +3,7 @@
 #include "tekit/strings/DynamicString.h"
 #include "tekit/strings/StringVector.h"
 
-#include "strings/MultiByteFixture.h"
+#include "support/MultiByteFixture.h"
 
 #include <gtest/gtest.h>
 

@@ -1,6 +1,6 @@
 // Properties over thousands of random values: what Format writes, CvtTo... reads back, and the
 // library's printf writes what the C runtime writes in the "C" locale.
-#include "MultiByteFixture.h"
+#include "support/MultiByteFixture.h"
 
 #include "tekit/strings/DynamicString.h"
 

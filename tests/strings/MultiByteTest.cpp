@@ -1,5 +1,5 @@
 // The lead-byte table and the byte-level helpers that every string operation is built on.
-#include "MultiByteFixture.h"
+#include "support/MultiByteFixture.h"
 
 #include "tekit/strings/DynamicString.h"
 

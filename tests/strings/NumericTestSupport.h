@@ -1,10 +1,5 @@
-// Helpers for the tests of number formatting and reading: catching a raised exception, and a
-// locale whose decimal separator is a comma.
+// A locale whose decimal separator is a comma, for the tests of number formatting and reading.
 #pragma once
-
-#include "tekit/errors/TEException.h"
-
-#include <gtest/gtest.h>
 
 #include <cstdlib>
 #include <string>
@@ -15,17 +10,6 @@
 #endif
 
 namespace tekit::testing {
-
-/// Runs `f`, which must raise, and returns what it raised.
-template <class F> TEException Raised(F&& f) {
-    try {
-        f();
-    } catch (TEException const& e) {
-        return e;
-    }
-    ADD_FAILURE() << "nothing was raised";
-    return TEException();
-}
 
 #if !defined(_WIN32)
 /// The name of an installed locale whose decimal separator is a comma, or "" when there is

@@ -1,6 +1,6 @@
 // Wide and UTF-8 text in and out of the family. Narrow text is in the lead-byte table's code
 // page: Latin-1 for code page 0 off Windows, Shift-JIS for 932.
-#include "MultiByteFixture.h"
+#include "support/MultiByteFixture.h"
 
 #include "tekit/strings/DynamicString.h"
 #include "tekit/strings/StaticString.h"

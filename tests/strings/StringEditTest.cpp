@@ -1,5 +1,4 @@
-#include "MultiByteFixture.h"
-#include "errors/DebugCapture.h"
+#include "support/MultiByteFixture.h"
 
 #include "tekit/strings/BufferString.h"
 #include "tekit/strings/DynamicString.h"
@@ -181,26 +180,6 @@ TEST(StringAppendSeparator, ListsAndJoins) {
     empty.AppendUsingSeparator(DynamicString("a"), "\\");
     empty.AppendUsingSeparator(empty, "/");
     EXPECT_EQ(Text(empty), "a/a");
-}
-
-TEST(StringMissingFormatArgument, AppendsTheArgumentAndWarnsOnlyForDevelopers) {
-    testing::DebugCapture capture;
-    {
-        testing::DiagnosticLevelScope level(0);
-        DynamicString s("No placeholder here.");
-        s.HandleMissingFormatArgument(DynamicString("%2"), DynamicString("arg"));
-        EXPECT_EQ(Text(s), "No placeholder here. COULD NOT FIND %2TO REPLACE WITH arg ");
-    }
-    EXPECT_EQ(capture.Text(), "");
-    {
-        testing::DiagnosticLevelScope level(1);
-        StaticString<64> s("x");
-        s.HandleMissingFormatArgument(DynamicString("%1"), s);
-        EXPECT_EQ(Text(s), "x COULD NOT FIND %1TO REPLACE WITH x ");
-    }
-    std::string const warning = capture.Text();
-    EXPECT_EQ(warning.rfind("WARNING! 'Could not find argument to replace in string'", 0), 0u);
-    EXPECT_NE(warning.find("in function String::HandleMissingFormatArgument"), std::string::npos);
 }
 
 } // namespace

@@ -1,6 +1,6 @@
 #include "tekit/strings/DynamicString.h"
 
-#include "strings/MultiByteFixture.h"
+#include "support/MultiByteFixture.h"
 
 #include <gtest/gtest.h>
 

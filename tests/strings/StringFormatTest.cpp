@@ -1,8 +1,7 @@
-#include "MultiByteFixture.h"
 #include "NumericTestSupport.h"
+#include "support/DebugCapture.h"
+#include "support/MultiByteFixture.h"
 
-#include "tekit/errors/DebugOutput.h"
-#include "tekit/errors/DiagnosticLevel.h"
 #include "tekit/errors/RString.h"
 #include "tekit/strings/DynamicString.h"
 #include "tekit/strings/StaticString.h"
@@ -54,43 +53,27 @@ TEST(Placeholders, FillTheFirstOccurrenceOfTheirPlainText) {
     EXPECT_STREQ(none.GetBufferReadPtr(), "ab");
 }
 
-TEST(Placeholders, AMissingPlaceholderAppendsANoticeWithTheArgument) {
-    DynamicString text("No placeholders here.", true);
-    text.Format("value", 2);
-    EXPECT_STREQ(text.GetBufferReadPtr(),
-                 "No placeholders here. COULD NOT FIND %2TO REPLACE WITH value ");
-
-    StaticString<64> fixed("Short");
-    fixed.Format(DynamicString("arg"), 12);
-    EXPECT_STREQ(fixed.GetBufferReadPtr(), "Short COULD NOT FIND %12TO REPLACE WITH arg ");
-}
-
-std::string gDebugText;
-void CaptureDebugText(char const* text, void*) {
-    gDebugText += text;
-}
-
-TEST(Placeholders, AMissingPlaceholderWarnsOnlyAboveDiagnosticLevelZero) {
-    int const savedLevel = OrvaneMiscUtil::GetDiagnosticLevel();
-    SetDebugOutputSink(CaptureDebugText, nullptr);
-    gDebugText.clear();
-
-    OrvaneMiscUtil::SetDiagnosticLevel(0);
-    DynamicString quiet("text", true);
-    quiet.Format("x", 1);
-    EXPECT_EQ(gDebugText, "");
-
-    OrvaneMiscUtil::SetDiagnosticLevel(1);
-    DynamicString loud("text", true);
-    loud.Format("x", 1);
-    EXPECT_EQ(gDebugText.rfind("WARNING! 'Could not find argument to replace in string' Line ", 0),
-              0u)
-        << gDebugText;
-    EXPECT_NE(gDebugText.find(" in function String::HandleMissingFormatArgument in file "),
+TEST(Placeholders, AMissingPlaceholderAppendsANoticeAndWarnsOnlyAboveDiagnosticLevelZero) {
+    testing::DebugCapture capture;
+    {
+        testing::DiagnosticLevelScope level(0);
+        DynamicString text("No placeholders here.", true);
+        text.Format("value", 2);
+        EXPECT_STREQ(text.GetBufferReadPtr(),
+                     "No placeholders here. COULD NOT FIND %2TO REPLACE WITH value ");
+    }
+    EXPECT_EQ(capture.Text(), "");
+    {
+        testing::DiagnosticLevelScope level(1);
+        StaticString<64> fixed("Short");
+        fixed.Format(DynamicString("arg"), 12);
+        EXPECT_STREQ(fixed.GetBufferReadPtr(), "Short COULD NOT FIND %12TO REPLACE WITH arg ");
+    }
+    std::string const warning = capture.Text();
+    EXPECT_EQ(warning.rfind("WARNING! 'Could not find argument to replace in string' Line ", 0), 0u)
+        << warning;
+    EXPECT_NE(warning.find(" in function String::HandleMissingFormatArgument in file "),
               std::string::npos);
-
-    SetDebugOutputSink(nullptr, nullptr);
-    OrvaneMiscUtil::SetDiagnosticLevel(savedLevel);
 }
 
 TEST(Placeholders, AnArgumentTakenFromTheStringItselfIsCopiedFirst) {
@@ -121,17 +104,19 @@ TEST_F(MultiByteFormat, PlaceholdersAfterDoubleByteCharactersAreFilled) {
 // ---- Typed values --------------------------------------------------------------------------
 
 TEST(TypedFormat, DefaultFormatsShowEachTypeInDecimal) {
-    EXPECT_EQ(Filled([](String& s) { s.Format(INT_MIN, 1); }), "-2147483648");
-    EXPECT_EQ(Filled([](String& s) { s.Format(-7L, 1); }), "-7");
-    EXPECT_EQ(Filled([](String& s) { s.Format(short(-32768), 1); }), "-32768");
-    EXPECT_EQ(Filled([](String& s) { s.Format('A', 1); }), "A");
-    EXPECT_EQ(Filled([](String& s) { s.Format(static_cast<unsigned char>(255), 1); }), "255");
-    EXPECT_EQ(Filled([](String& s) { s.Format(static_cast<unsigned short>(65535), 1); }), "65535");
-    EXPECT_EQ(Filled([](String& s) { s.Format(4294967295u, 1); }), "4294967295");
+    DynamicString s("%1 %2 %3 %4 %5 %6 %7 %8 %9", true);
+    s.Format(INT_MIN, 1, nullptr);
+    s.Format(short(-32768), 2);
+    s.Format('A', 3);
+    s.Format(static_cast<unsigned char>(255), 4);
+    s.Format(static_cast<unsigned short>(65535), 5);
+    s.Format(4294967295u, 6);
+    s.Format(LLONG_MIN, 7);
+    s.Format(ULLONG_MAX, 8);
+    s.Format(-7L, 9);
+    EXPECT_STREQ(s.GetBufferReadPtr(), "-2147483648 -32768 A 255 65535 4294967295 "
+                                       "-9223372036854775808 18446744073709551615 -7");
     EXPECT_EQ(Filled([](String& s) { s.Format(ULONG_MAX, 1); }), std::to_string(ULONG_MAX));
-    EXPECT_EQ(Filled([](String& s) { s.Format(LLONG_MIN, 1); }), "-9223372036854775808");
-    EXPECT_EQ(Filled([](String& s) { s.Format(ULLONG_MAX, 1); }), "18446744073709551615");
-    EXPECT_EQ(Filled([](String& s) { s.Format(5, 1, nullptr); }), "5");
 }
 
 TEST(TypedFormat, FieldsShowTheValueAtTheWidthOfItsType) {

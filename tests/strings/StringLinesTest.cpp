@@ -1,4 +1,4 @@
-#include "MultiByteFixture.h"
+#include "support/MultiByteFixture.h"
 
 #include "tekit/strings/DynamicString.h"
 #include "tekit/strings/StaticString.h"

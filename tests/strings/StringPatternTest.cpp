@@ -1,7 +1,7 @@
 #include "tekit/strings/DynamicString.h"
 
-#include "strings/MultiByteFixture.h"
 #include "strings/TextItems.h"
+#include "support/MultiByteFixture.h"
 
 #include <gtest/gtest.h>
 

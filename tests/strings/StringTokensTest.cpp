@@ -1,8 +1,8 @@
 #include "tekit/strings/DynamicString.h"
 
-#include "strings/MultiByteFixture.h"
-#include "strings/NumericTestSupport.h"
 #include "strings/TextItems.h"
+#include "support/MultiByteFixture.h"
+#include "support/Raises.h"
 
 #include <gtest/gtest.h>
 
@@ -91,11 +91,8 @@ TEST(LocationStrings, MalformedLocationsRaiseWithTheLocationInTheMessage) {
     };
     for (auto const& [location, description] : cases) {
         StringVector parts;
-        TEException const e = tekit::testing::Raised(
-            [&] { String::ParseLocationString(DynamicString(location), parts, true); });
-        EXPECT_EQ(e.GetErrorCode(), TE_BAD_PROP_OR_VAR_NAME);
-        EXPECT_STREQ(e.GetDescription(), description);
-        EXPECT_STREQ(e.GetFunctionName(), "String::ParseLocationString");
+        EXPECT_RAISES_IN(String::ParseLocationString(DynamicString(location), parts, true),
+                         TE_BAD_PROP_OR_VAR_NAME, "String::ParseLocationString", description);
     }
 }
 

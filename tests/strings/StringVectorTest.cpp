@@ -1,10 +1,13 @@
 #include "tekit/strings/DynamicString.h"
 
-#include "strings/MultiByteFixture.h"
-#include "strings/NumericTestSupport.h"
 #include "strings/TextItems.h"
+#include "support/MultiByteFixture.h"
+#include "support/Raises.h"
 
 #include <gtest/gtest.h>
+#if TEKIT_HAS_OLE
+#include <comdef.h> // the _bstr_t, BSTR and SAFEARRAY cases
+#endif
 
 #include <string>
 
@@ -60,17 +63,12 @@ TEST(CommaSeparatedText, ReadingFollowsTheQuotingRules) {
 TEST(CommaSeparatedText, BadDelimiterOrUnterminatedQuoteRaisesAndKeepsTheItems) {
     StringVector v = Make({"kept"});
     DynamicString csv;
-    TEException e = tekit::testing::Raised([&] { v.CreateCSVString(csv, '"'); });
-    EXPECT_EQ(e.GetErrorCode(), TE_INVALID_OR_OUT_OF_RANGE);
-    EXPECT_STREQ(e.GetDescription(),
-                 "A quote character cannot be used as the delimiter of comma-separated text.");
-    EXPECT_STREQ(e.GetFunctionName(), "StringVector::CreateCSVString");
-    e = tekit::testing::Raised([&] { v.SetFromCSVString(DynamicString("a\"b"), '"'); });
-    EXPECT_EQ(e.GetErrorCode(), TE_INVALID_OR_OUT_OF_RANGE);
-    e = tekit::testing::Raised([&] { v.SetFromCSVString(DynamicString("a,\"bc")); });
-    EXPECT_EQ(e.GetErrorCode(), TE_UNRECOGNIZED_VALUE);
-    EXPECT_STREQ(e.GetDescription(),
-                 "Comma-separated text has a quoted item without its closing quote: a,\"bc");
+    EXPECT_RAISES_IN(v.CreateCSVString(csv, '"'), TE_INVALID_OR_OUT_OF_RANGE,
+                     "StringVector::CreateCSVString",
+                     "A quote character cannot be used as the delimiter of comma-separated text.");
+    EXPECT_RAISES(v.SetFromCSVString(DynamicString("a\"b"), '"'), TE_INVALID_OR_OUT_OF_RANGE);
+    EXPECT_RAISES_IN(v.SetFromCSVString(DynamicString("a,\"bc")), TE_UNRECOGNIZED_VALUE, nullptr,
+                     "Comma-separated text has a quoted item without its closing quote: a,\"bc");
     EXPECT_EQ(Items(v), V{"kept"});
 }
 
@@ -112,10 +110,9 @@ TEST(StringVectorSafeArray, StringsRoundTripAndOtherArraysAreRefused) {
     EXPECT_EQ(Items(back), Items(items));
 
     SAFEARRAY* numbers = SafeArrayCreateVector(VT_I4, 0, 2);
-    TEException const e = tekit::testing::Raised([&] { back.SetFromSafeArray(numbers); });
+    EXPECT_RAISES_IN(back.SetFromSafeArray(numbers), TE_TYPE_MISMATCH_ERROR, nullptr,
+                     "Expected a one-dimensional array of strings.");
     SafeArrayDestroy(numbers);
-    EXPECT_EQ(e.GetErrorCode(), TE_TYPE_MISMATCH_ERROR);
-    EXPECT_STREQ(e.GetDescription(), "Expected a one-dimensional array of strings.");
     back.SetFromSafeArray(nullptr);
     EXPECT_TRUE(back.empty());
 }
