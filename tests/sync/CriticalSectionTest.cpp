@@ -1,0 +1,193 @@
+// The lock interface's defaults and the recursive critical sections.
+#include "sync/CriticalSectionObjects.h"
+
+#include "tekit/sync/CriticalSections.h"
+#include "tekit/sync/Interlock.h"
+#include "tekit/sync/LockPools.h"
+
+#include <gtest/gtest.h>
+
+#include <atomic>
+#include <chrono>
+#include <functional>
+#include <memory>
+#include <new>
+#include <thread>
+#include <utility>
+#include <vector>
+
+namespace tekit {
+namespace {
+
+// Each class has the lock level it is documented with, as a distinct type.
+template <std::int32_t level, class Lock>
+constexpr bool kHasLevel = std::is_base_of_v<CriticalSectionLevelValidation<level>, Lock>;
+static_assert(kHasLevel<INT32_MIN, OSCriticalSection> &&
+              kHasLevel<INT32_MIN, GlobalOSCriticalSection> &&
+              kHasLevel<INT32_MIN + 2, TestObjectArrayCriticalSectionThatAlwaysHasOnUnlock> &&
+              kHasLevel<INT32_MIN, OVCriticalSection> &&
+              kHasLevel<INT32_MIN, NamedCriticalSection> &&
+              kHasLevel<INT32_MIN + 1, SubpropertiesLockCriticalSection> &&
+              kHasLevel<3, TestObjectMemberCriticalSection> &&
+              kHasLevel<4, UltraFiniteCriticalSection>);
+static_assert(!kHasLevel<3, UltraFiniteCriticalSection>);
+
+struct AnyLock {
+    char const* name;
+    std::unique_ptr<Lockable> lock;
+    bool isReaderWriter;
+};
+
+/// One of every concrete lock, fresh.
+std::vector<AnyLock> EveryLock() {
+    std::vector<AnyLock> locks;
+    locks.push_back({"OSCriticalSection", std::make_unique<OSCriticalSection>(), false});
+    locks.push_back(
+        {"GlobalOSCriticalSection", std::make_unique<GlobalOSCriticalSection>(), false});
+    locks.push_back({"TestObjectArrayCriticalSectionThatAlwaysHasOnUnlock",
+                     std::make_unique<TestObjectArrayCriticalSectionThatAlwaysHasOnUnlock>(),
+                     false});
+    locks.push_back({"OVCriticalSection", std::make_unique<OVCriticalSection>(), true});
+    locks.push_back({"NamedCriticalSection", std::make_unique<NamedCriticalSection>(), true});
+    locks.push_back({"SubpropertiesLockCriticalSection",
+                     std::make_unique<SubpropertiesLockCriticalSection>(), true});
+    locks.push_back({"TestObjectMemberCriticalSection",
+                     std::make_unique<TestObjectMemberCriticalSection>(), true});
+    locks.push_back(
+        {"UltraFiniteCriticalSection", std::make_unique<UltraFiniteCriticalSection>(), true});
+    return locks;
+}
+
+/// Runs `body` on another thread and waits for it.
+void OnOtherThread(std::function<void()> const& body) {
+    std::thread(body).join();
+}
+
+TEST(Lockable, EveryLockRefusesReferenceCountingAndIsFreeWhenMade) {
+    for (auto& [name, lock, isReaderWriter] : EveryLock()) {
+        SCOPED_TRACE(name);
+        EXPECT_FALSE(lock->AddRef());
+        lock->Release();
+        lock->SetAddRefReleaseCallback(nullptr, nullptr, nullptr);
+        EXPECT_EQ(lock->GetThreadId(), 0u);
+        EXPECT_EQ(lock->CurrentThreadOwnsLock(kExclusiveAccess), kDoesNotOwnLock);
+        EXPECT_EQ(lock->IsReaderWriterLock(), isReaderWriter);
+    }
+}
+
+TEST(Lockable, EveryLockIsExclusiveAndRecursiveForItsWriter) {
+    for (auto& [name, lock, isReaderWriter] : EveryLock()) {
+        SCOPED_TRACE(name);
+        ASSERT_TRUE(lock->Lock(kExclusiveAccess, 0));
+        ASSERT_TRUE(lock->TryLock(kExclusiveAccess, 0)) << "the owner deepens its hold";
+        EXPECT_EQ(lock->GetThreadId(), detail::CurrentLockThreadId());
+        EXPECT_EQ(lock->CurrentThreadOwnsLock(kExclusiveAccess), kOwnsLockExclusively);
+        bool otherGotIt = true;
+        OnOtherThread([&] {
+            otherGotIt = lock->TryLock(kExclusiveAccess, 0);
+            EXPECT_EQ(lock->CurrentThreadOwnsLock(kExclusiveAccess), kDoesNotOwnLock);
+        });
+        EXPECT_FALSE(otherGotIt);
+        lock->Unlock(kExclusiveAccess);
+        OnOtherThread([&] { otherGotIt = lock->TryLock(kExclusiveAccess, 0); });
+        EXPECT_FALSE(otherGotIt) << "still held once";
+        lock->Unlock(kExclusiveAccess);
+        EXPECT_EQ(lock->GetThreadId(), 0u);
+        OnOtherThread([&] {
+            otherGotIt = lock->TryLock(kExclusiveAccess, 0);
+            lock->Unlock(kExclusiveAccess);
+        });
+        EXPECT_TRUE(otherGotIt);
+    }
+}
+
+// A timeout is accepted and ignored: even 0 waits until the holder lets go.
+TEST(Lockable, LockWaitsForTheHolderWhateverTheTimeout) {
+    for (auto& [name, lock, isReaderWriter] : EveryLock()) {
+        SCOPED_TRACE(name);
+        std::atomic<bool> released{false};
+        lock->Lock(kExclusiveAccess, 0);
+        std::thread waiter([&, &lock = lock] {
+            EXPECT_TRUE(lock->Lock(kExclusiveAccess, 0));
+            EXPECT_TRUE(released.load());
+            lock->Unlock(kExclusiveAccess);
+        });
+        std::this_thread::sleep_for(std::chrono::milliseconds(30));
+        released = true;
+        lock->Unlock(kExclusiveAccess);
+        waiter.join();
+    }
+}
+
+struct UnlockCall {
+    bool aboutToRelease;
+    std::uint32_t ownerDuringCall;
+};
+
+struct CallbackLog {
+    TestObjectArrayCriticalSectionThatAlwaysHasOnUnlock* section = nullptr;
+    std::vector<UnlockCall> calls;
+};
+
+void RecordUnlock(void* context, bool aboutToRelease) {
+    auto* log = static_cast<CallbackLog*>(context);
+    log->calls.push_back({aboutToRelease, log->section->GetThreadId()});
+}
+
+TEST(CriticalSection, UnlockCallbackRunsTwiceAroundTheOutermostReleaseOnly) {
+    TestObjectArrayCriticalSectionThatAlwaysHasOnUnlock section;
+    CallbackLog log{&section, {}};
+    section.SetOnUnlockCallback(&RecordUnlock, &log);
+    section.Lock(kExclusiveAccess, 0);
+    section.Lock(kSharedAccess, 0);
+    ASSERT_TRUE(section.TryLock(kExclusiveAccess, 0));
+    section.Unlock(kExclusiveAccess);
+    section.Unlock(kExclusiveAccess);
+    EXPECT_TRUE(log.calls.empty());
+    section.Unlock(kExclusiveAccess);
+    std::uint32_t const self = detail::CurrentLockThreadId();
+    ASSERT_EQ(log.calls.size(), 2u);
+    EXPECT_TRUE(log.calls[0].aboutToRelease);
+    EXPECT_EQ(log.calls[0].ownerDuringCall, self) << "still held during the first call";
+    EXPECT_FALSE(log.calls[1].aboutToRelease);
+    EXPECT_EQ(log.calls[1].ownerDuringCall, 0u) << "already released during the second";
+
+    section.SetOnUnlockCallback(nullptr, nullptr); // back to no callback: nothing runs
+    section.Lock(kExclusiveAccess, 0);
+    section.Unlock(kExclusiveAccess);
+    EXPECT_EQ(log.calls.size(), 2u);
+}
+
+TEST(CriticalSection, OnlyAGlobalSectionLeavesItsSystemObjectAlive) {
+    std::uint32_t const before = detail::DeletedCriticalSectionObjects();
+    { GlobalOSCriticalSection global; }
+    EXPECT_EQ(detail::DeletedCriticalSectionObjects(), before);
+    { OSCriticalSection plain; }
+    EXPECT_EQ(detail::DeletedCriticalSectionObjects(), before + 1);
+}
+
+TEST(CriticalSection, InterlockSwitchHasNoEffect) {
+    EXPECT_FALSE(GetInterlockDisabled());
+    SetInterlockDisabled(true);
+    EXPECT_FALSE(GetInterlockDisabled());
+}
+
+TEST(LockPools, PoolsAndCountersAreReadyAtLoad) {
+    for (NamedCriticalSection& lock : gNamedLocks)
+        EXPECT_TRUE(lock.IsReaderWriterLock());
+    std::size_t busy = 0;
+    for (UltraFiniteCriticalSection& lock : gUltraFiniteLocks)
+        busy += lock.GetThreadId() != 0;
+    for (TestObjectMemberCriticalSection& lock : gTestObjectMemberLocks)
+        busy += lock.GetThreadId() != 0;
+    EXPECT_EQ(busy, 0u);
+    UltraFiniteCriticalSection& last = gUltraFiniteLocks[kUltraFiniteLockCount - 1];
+    ASSERT_TRUE(last.Lock(kExclusiveAccess, 0));
+    last.Unlock(kExclusiveAccess);
+    EXPECT_EQ(gPerformanceOptions, 0);
+    EXPECT_EQ(gRWLockContentionCount + gRWLockShareCount + gRWLockSleepCount + gRWLockTotalCount,
+              0);
+}
+
+} // namespace
+} // namespace tekit
