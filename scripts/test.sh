@@ -2,7 +2,7 @@
 # The whole test run: installs what is missing, then builds and tests every leg this machine
 # can run, stopping at the first failure.
 #
-#   scripts/test.sh                        # dev (warnings as errors), asan, then Windows
+#   scripts/test.sh                        # dev (warnings as errors), asan, tsan, then Windows
 #   TEKIT_SKIP_WINDOWS=1 scripts/test.sh   # the Linux legs only
 #
 # The Windows legs are scripts/test-windows.sh. The last line counts the test cases of every
@@ -65,6 +65,8 @@ mkdir -p "$logs"
 
 run_leg dev linux_leg dev -DTEKIT_WERROR=ON
 ASAN_OPTIONS=allocator_may_return_null=1:detect_leaks=1 run_leg asan linux_leg asan
+# Locks and copy-on-write strings shared across threads, under the race detector.
+TSAN_OPTIONS=halt_on_error=1 run_leg tsan linux_leg tsan
 
 if [[ "${TEKIT_SKIP_WINDOWS:-0}" == 1 ]]; then
     summary+=("windows        skipped (TEKIT_SKIP_WINDOWS=1)")
