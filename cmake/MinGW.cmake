@@ -18,11 +18,14 @@ function(tekit_configure_mingw_library target)
   target_link_libraries(${target} PUBLIC ole32 oleaut32 uuid)
   if(CMAKE_SIZEOF_VOID_P EQUAL 4)
     # Flat functions use the standard call on 32-bit Windows; --kill-at exports them as "Foo"
-    # instead of "Foo@8", the names callers look up with GetProcAddress.
-    set(_def ${CMAKE_CURRENT_BINARY_DIR}/${target}.def)
-    target_link_options(${target} PRIVATE -Wl,--kill-at -Wl,--output-def,${_def})
+    # instead of "Foo@8", the names callers look up with GetProcAddress. The import library is
+    # rebuilt from the linker's record of every export (the C++ ones too), decorated again from
+    # the DLL's symbol table so that callers compiled against the headers find "_Foo@8".
+    set(_linked_def ${CMAKE_CURRENT_BINARY_DIR}/${target}-linked.def)
+    target_link_options(${target} PRIVATE -Wl,--kill-at -Wl,--output-def,${_linked_def})
     add_custom_command(TARGET ${target} POST_BUILD
-                       COMMAND ${CMAKE_COMMAND} -DDEF=${_def} -DDLLTOOL=${CMAKE_DLLTOOL}
+                       COMMAND ${CMAKE_COMMAND} -DDEF=${_linked_def} -DDLLTOOL=${CMAKE_DLLTOOL}
+                               -DNM=${CMAKE_NM} -DDLL=$<TARGET_FILE:${target}>
                                -DDLL_NAME=$<TARGET_FILE_NAME:${target}>
                                -DIMPLIB=$<TARGET_LINKER_FILE:${target}>
                                -P ${CMAKE_CURRENT_FUNCTION_LIST_DIR}/MinGWImportLibrary.cmake

@@ -1,0 +1,14 @@
+#include "platform/AssertBox.h"
+
+#include <cstdio>
+
+namespace tekit::platform {
+
+// No desktop to ask: the text goes where a terminal or a log collects it.
+void ShowAssertBox(char const* /*caption*/, char const* text) {
+    std::fputs(text ? text : "", stderr);
+    std::fputc('\n', stderr);
+    std::fflush(stderr);
+}
+
+} // namespace tekit::platform

@@ -1,0 +1,63 @@
+#include "tekit/toolbox/Handle.h"
+
+#include "toolbox/HandleAssert.h"
+
+#include <gtest/gtest.h>
+
+#include <cstring>
+#include <string>
+
+namespace {
+
+TEST(HandleTest, NewHandleIsZeroFilledAndSizeZeroHasNoBlock) {
+    Handle h = NewHandle(32);
+    ASSERT_NE(h, nullptr);
+    EXPECT_EQ(GetHandleSize(h), 32u);
+    EXPECT_EQ(std::string(static_cast<char*>(h->block), 32), std::string(32, '\0'));
+    DisposeHandle(h);
+
+    Handle empty = NewHandle(0);
+    ASSERT_NE(empty, nullptr);
+    EXPECT_EQ(empty->block, nullptr);
+    EXPECT_EQ(GetHandleSize(empty), 0u);
+    DisposeHandle(empty);
+    DisposeHandle(nullptr); // ignored
+}
+
+TEST(HandleTest, ResizeKeepsContentAndZeroFillsWhatIsAdded) {
+    Handle h = NewHandle(4);
+    std::memcpy(h->block, "abcd", 4);
+    ASSERT_EQ(SetHandleSize(h, 4096), 1);
+    EXPECT_EQ(std::memcmp(h->block, "abcd", 4), 0);
+    EXPECT_EQ(std::string(static_cast<char*>(h->block) + 4, 4092), std::string(4092, '\0'));
+
+    ASSERT_EQ(SetHandleSize(h, 2), 1); // shrink, then grow again: no stale bytes come back
+    ASSERT_EQ(SetHandleSize(h, 4), 1);
+    EXPECT_EQ(std::memcmp(h->block, "ab\0\0", 4), 0);
+
+    ASSERT_EQ(SetHandleSize(h, 0), 1);
+    EXPECT_EQ(h->block, nullptr);
+    ASSERT_EQ(SetHandleSize(h, 3), 1);
+    EXPECT_EQ(GetHandleSize(h), 3u);
+    DisposeHandle(h);
+}
+
+TEST(HandleTest, AssertTextNamesMessageLineAndFile) {
+    EXPECT_EQ(
+        tekit::toolbox::AssertText("Parameter 1 to GetHandleSize was NULL.", 42, "Handle.cpp"),
+        "Assert!\n\nParameter 1 to GetHandleSize was NULL.\n\nThe error was detected on "
+        "line 42 of file 'Handle.cpp'.\n\nProgram aborting.");
+}
+
+// On Windows the text goes to a message box, which would wait for a click.
+#if !defined(_WIN32)
+TEST(HandleDeathTest, NullHandleAbortsWithTheAssertText) {
+    GTEST_FLAG_SET(death_test_style, "threadsafe");
+    EXPECT_DEATH(GetHandleSize(nullptr),
+                 "Assert!\n\nParameter 1 to GetHandleSize was NULL.\n\nThe error was detected on "
+                 "line [0-9]+ of file 'Handle.cpp'.\n\nProgram aborting.");
+    EXPECT_DEATH(SetHandleSize(nullptr, 4), "Parameter 1 to SetHandleSize was NULL.");
+}
+#endif
+
+} // namespace

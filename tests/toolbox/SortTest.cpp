@@ -1,0 +1,220 @@
+#include "tekit/toolbox/Sort.h"
+#include "tekit/toolbox/List.h"
+
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <cstdint>
+#include <cstring>
+#include <random>
+#include <stdexcept>
+#include <string>
+#include <vector>
+
+namespace {
+
+int TEKIT_CDECL CompareInts(void const* a, void const* b) {
+    int const x = *static_cast<int const*>(a), y = *static_cast<int const*>(b);
+    return x < y ? -1 : x > y;
+}
+
+/// A 12-byte record ordered by its key only, so stability and payload moves are visible.
+struct Record {
+    int key;
+    int order;
+    int check;
+};
+
+int TEKIT_CDECL CompareKeys(void const* a, void const* b) {
+    return CompareInts(a, b);
+}
+
+using SortFunction = std::int32_t(TEKIT_STDCALL*)(void*, std::int32_t, std::int32_t,
+                                                  CompareFunction);
+struct Named {
+    char const* name;
+    SortFunction sort;
+};
+Named const kSorts[] = {{"heap", HeapSort}, {"quick", QuickSort}, {"insertion", InsertionSort}};
+
+std::vector<int> Data(std::size_t n, int range, unsigned seed) {
+    std::mt19937 random(seed);
+    std::uniform_int_distribution<int> value(-range, range);
+    std::vector<int> data(n);
+    for (int& v : data)
+        v = value(random);
+    return data;
+}
+
+TEST(SortTest, AgreesWithStdSortOnRandomSortedReversedAndEqualKeys) {
+    for (auto const& [name, sort] : kSorts) {
+        for (std::size_t n : {0u, 1u, 2u, 3u, 16u, 17u, 100u, 2000u}) {
+            for (int range : {0, 3, 1000000}) { // all equal, many equal, mostly distinct
+                std::vector<std::vector<int>> inputs{Data(n, range, unsigned(n + range))};
+                inputs.push_back(inputs[0]);
+                std::sort(inputs[1].begin(), inputs[1].end());
+                inputs.push_back(inputs[1]);
+                std::reverse(inputs[2].begin(), inputs[2].end());
+                for (auto data : inputs) {
+                    std::vector<int> expected = data;
+                    std::sort(expected.begin(), expected.end());
+                    ASSERT_EQ(sort(data.data(), std::int32_t(n), sizeof(int), CompareInts), 1);
+                    ASSERT_EQ(data, expected) << name << " n=" << n << " range=" << range;
+                }
+            }
+        }
+    }
+}
+
+TEST(SortTest, LargeItemsMoveWhole) {
+    for (auto const& [name, sort] : kSorts) {
+        std::vector<Record> records;
+        for (int i = 0; i < 500; ++i) {
+            int const key = int((i * 7919) % 37);
+            records.push_back({key, i, key * 31 + 1});
+        }
+        ASSERT_EQ(sort(records.data(), 500, sizeof(Record), CompareKeys), 1);
+        for (std::size_t i = 0; i < records.size(); ++i) {
+            ASSERT_EQ(records[i].check, records[i].key * 31 + 1) << name;
+            if (i > 0) {
+                ASSERT_LE(records[i - 1].key, records[i].key) << name;
+            }
+        }
+        if (sort != InsertionSort)
+            continue;
+        for (std::size_t i = 1; i < records.size(); ++i) { // stable: equal keys keep their order
+            if (records[i - 1].key == records[i].key) {
+                ASSERT_LT(records[i - 1].order, records[i].order);
+            }
+        }
+    }
+}
+
+TEST(SortTest, NullComparisonOrdersByUnsignedBytes) {
+    for (auto const& [name, sort] : kSorts) {
+        std::vector<std::string> words{"pear", "\xFF\x01zz", "appl", "pea\x80", "Zulu", "pear"};
+        std::string bytes;
+        for (auto const& w : words)
+            bytes += w;
+        ASSERT_EQ(sort(bytes.data(), 6, 4, nullptr), 1);
+        std::sort(words.begin(), words.end(), [](auto const& a, auto const& b) {
+            return std::memcmp(a.data(), b.data(), 4) < 0;
+        });
+        std::string expected;
+        for (auto const& w : words)
+            expected += w;
+        EXPECT_EQ(bytes, expected) << name;
+    }
+}
+
+TEST(SortTest, BadArgumentsChangeNothing) {
+    for (auto const& [name, sort] : kSorts) {
+        std::vector<int> data{3, 2, 1};
+        EXPECT_EQ(sort(nullptr, 3, 4, CompareInts), 0) << name;
+        EXPECT_EQ(sort(data.data(), -1, 4, CompareInts), 0);
+        EXPECT_EQ(sort(data.data(), 3, 0, CompareInts), 0);
+        EXPECT_EQ(sort(data.data(), 3, -4, CompareInts), 0);
+        EXPECT_EQ(sort(data.data(), 1, 4, CompareInts), 1);
+        EXPECT_EQ(data, (std::vector<int>{3, 2, 1}));
+    }
+}
+
+/// An order that answers at random: the sorts must stay inside the array and keep its items.
+int TEKIT_CDECL Inconsistent(void const*, void const*) {
+    static std::minstd_rand random(7);
+    return int(random() % 3) - 1;
+}
+
+TEST(SortTest, InconsistentOrderKeepsTheItems) {
+    for (auto const& [name, sort] : kSorts) {
+        std::vector<int> data = Data(3000, 50, 11);
+        std::vector<int> sortedInput = data;
+        std::sort(sortedInput.begin(), sortedInput.end());
+        EXPECT_EQ(sort(data.data(), 3000, sizeof(int), Inconsistent), 1);
+        std::sort(data.begin(), data.end());
+        EXPECT_EQ(data, sortedInput) << name;
+    }
+}
+
+TEST(SortTest, ThrowingComparisonFailsAndKeepsTheItems) {
+    for (auto const& [name, sort] : kSorts) {
+        std::vector<int> data = Data(200, 1000, 5);
+        std::vector<int> items = data;
+        static int calls;
+        calls = 0;
+        auto throwing = [](void const* a, void const* b) -> int {
+            if (++calls == 150)
+                throw std::runtime_error("stop");
+            return CompareInts(a, b);
+        };
+        EXPECT_EQ(sort(data.data(), 200, sizeof(int), throwing), 0) << name;
+        std::sort(data.begin(), data.end());
+        std::sort(items.begin(), items.end());
+        EXPECT_EQ(data, items) << name;
+    }
+}
+
+TEST(BinSearchTest, ReturnsIndexOrEncodedInsertionPoint) {
+    for (int n : {0, 1, 5, 6, 7, 8, 50}) {
+        std::vector<int> values;
+        for (int i = 0; i < n; ++i)
+            values.push_back(10 * i);
+        for (int key = -5; key <= 10 * n + 5; key += 5) {
+            std::int32_t const got = BinSearch(values.data(), n, sizeof(int), &key, CompareInts);
+            auto const at = std::lower_bound(values.begin(), values.end(), key) - values.begin();
+            if (key % 10 == 0 && key >= 0 && key < 10 * n)
+                EXPECT_EQ(got, at) << n << " " << key;
+            else
+                EXPECT_EQ(got, -std::int32_t(at) - 1) << n << " " << key;
+        }
+    }
+    int const key = 1;
+    EXPECT_EQ(BinSearch(nullptr, 3, 4, &key, CompareInts), -1);
+    EXPECT_EQ(BinSearch(&key, 1, 4, nullptr, CompareInts), -1);
+    EXPECT_EQ(BinSearch(&key, 1, 0, &key, CompareInts), -1);
+}
+
+/// Records each probe, to show which entries the search looks at.
+std::vector<int> gProbes;
+int TEKIT_CDECL RecordingCompare(void const* key, void const* item) {
+    gProbes.push_back(*static_cast<int const*>(item));
+    return CompareInts(key, item);
+}
+
+TEST(BinSearchTest, HalvesSevenOrMoreEntriesAndWalksFewer) {
+    std::vector<int> const six{0, 1, 2, 3, 4, 5};
+    int const key = 5;
+    gProbes.clear();
+    EXPECT_EQ(BinSearch(six.data(), 6, sizeof(int), &key, RecordingCompare), 5);
+    EXPECT_EQ(gProbes, (std::vector<int>{0, 1, 2, 3, 4, 5}));
+
+    std::vector<int> const seven{0, 1, 2, 3, 4, 5, 6};
+    int const high = 6;
+    gProbes.clear();
+    EXPECT_EQ(BinSearch(seven.data(), 7, sizeof(int), &high, RecordingCompare), 6);
+    EXPECT_EQ(gProbes, (std::vector<int>{3, 4, 5, 6})); // middle, then 3 left: linear
+
+    int const low = -1;
+    gProbes.clear();
+    EXPECT_EQ(BinSearch(seven.data(), 7, sizeof(int), &low, RecordingCompare), -1);
+    EXPECT_EQ(gProbes, (std::vector<int>{3, 0}));
+}
+
+TEST(ListSortTest, WrappersSortListsAndLeaveEmptyOnesAlone) {
+    using ListSort = void(TEKIT_STDCALL*)(ListType, CompareFunction);
+    for (ListSort sort : {ListHeapSort, ListQuickSort, ListInsertionSort}) {
+        std::vector<int> data = Data(300, 20, 3);
+        ListType list = ListCreate(sizeof(int));
+        ListInsertItems(list, data.data(), LIST_POS_END, 300);
+        sort(list, CompareInts);
+        std::sort(data.begin(), data.end());
+        EXPECT_EQ(std::memcmp(ListGetDataPtr(list), data.data(), 300 * sizeof(int)), 0);
+        ListClear(list);
+        sort(list, CompareInts);
+        EXPECT_EQ(ListNumItems(list), 0);
+        ListDispose(list);
+        sort(nullptr, CompareInts);
+    }
+}
+
+} // namespace
