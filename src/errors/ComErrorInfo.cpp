@@ -2,7 +2,7 @@
 // HRESULT with the error information the callee left.
 #include "tekit/errors/ComErrorInfo.h"
 
-#include "platform/Platform.h"
+#include "platform/ErrorInfo.h"
 #include "tekit/errors/Raise.h"
 
 #include <string>

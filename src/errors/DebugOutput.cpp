@@ -1,7 +1,7 @@
 // The debug-output sink: one replaceable writer of diagnostic text, guarded across threads.
 #include "tekit/errors/DebugOutput.h"
 
-#include "platform/Platform.h"
+#include "platform/DebugOutput.h"
 
 #include <atomic>
 #include <chrono>

@@ -1,7 +1,7 @@
 // The process-wide diagnostic level, read once from TEKIT_DIAGNOSTIC_LEVEL and settable.
 #include "tekit/errors/DiagnosticLevel.h"
 
-#include "platform/Platform.h"
+#include "platform/Environment.h"
 
 #include <atomic>
 #include <cerrno>

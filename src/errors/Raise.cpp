@@ -2,7 +2,7 @@
 #include "tekit/errors/Raise.h"
 
 #include "errors/Warning.h"
-#include "platform/Platform.h"
+#include "platform/SystemError.h"
 #include "tekit/errors/DiagnosticLevel.h"
 #include "tekit/errors/TEException.h"
 

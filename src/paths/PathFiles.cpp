@@ -2,7 +2,8 @@
 #include "tekit/paths/PathBase.h"
 
 #include "paths/PathRules.h"
-#include "platform/Platform.h"
+#include "platform/File.h"
+#include "platform/SystemError.h"
 #include "tekit/errors/RString.h"
 #include "tekit/errors/Raise.h"
 #include "tekit/paths/DynamicPath.h"
@@ -13,17 +14,29 @@
 
 namespace tekit {
 
-using platform::FileError;
+using platform::SystemError;
 
 namespace {
+
+/// The TEError of a native error: errno through the C runtime's numbering, Win32 codes as
+/// file errors. ENOTSUP has no row in the runtime's errno table and says what it means.
+TEError ToTEError(SystemError const& error) {
+#if defined(_WIN32)
+    return Win32FileIOErrorToTEError(static_cast<unsigned>(error.code));
+#else
+    if (error.code == platform::native::kNotSupported)
+        return TE_NOT_SUPPORTED;
+    return ErrnoToTEError(platform::NativeErrnoToCrtErrno(static_cast<int>(error.code)));
+#endif
+}
 
 /// The "ERR_DESCR" message `key` with the paths as its first placeholders and the system's
 /// reason, the code's own message, as the last. Filled from the last placeholder back, so a
 /// '%' in a path is never taken for a placeholder.
-DynamicString Describe(char const* key, FileError const& error, char const* path,
+DynamicString Describe(char const* key, SystemError const& error, char const* path,
                        char const* other = nullptr) {
     DynamicString message(static_cast<char const*>(RString("ERR_DESCR", key)), true);
-    RString const reason = TEErrorToRString(TEError(error.code));
+    RString const reason = TEErrorToRString(ToTEError(error));
     long const reasonNumber = other ? 3 : 2;
     message.Format(static_cast<char const*>(reason), reasonNumber);
     if (other)
@@ -35,33 +48,28 @@ DynamicString Describe(char const* key, FileError const& error, char const* path
 } // namespace
 
 #define TE_RAISE_FILE_ERROR(error, description, function)                                          \
-    TE_RAISE_API(TEError((error).code), (description), (function), (error).apiFunction,            \
-                 (error).systemCode)
+    TE_RAISE_API(ToTEError(error), (description), (function), (error).apiFunction, (error).code)
 
 bool PathBase::Exists() const {
     platform::FileInfo info;
-    FileError error;
-    return platform::QueryFile(CStr(), info, error);
+    return !platform::QueryFile(CStr(), info);
 }
 
 bool PathBase::IsDirectory() {
     if (sIsDirectory(GetPathString()))
         return true;
     platform::FileInfo info;
-    FileError error;
-    return platform::QueryFile(CStr(), info, error) && info.isDirectory;
+    return !platform::QueryFile(CStr(), info) && info.isDirectory;
 }
 
 bool PathBase::IsReadOnly() const {
     platform::FileInfo info;
-    FileError error;
-    return platform::QueryFile(CStr(), info, error) && info.isReadOnly;
+    return !platform::QueryFile(CStr(), info) && info.isReadOnly;
 }
 
 std::uint64_t PathBase::GetFileSize() const {
     platform::FileInfo info;
-    FileError error;
-    if (!platform::QueryFile(CStr(), info, error))
+    if (SystemError const error = platform::QueryFile(CStr(), info))
         TE_RAISE_FILE_ERROR(error, Describe("PATH_CANT_READ_INFO_1_2", error, CStr()),
                             "PathBase::GetFileSize");
     return info.size;
@@ -71,8 +79,7 @@ std::uint64_t PathBase::GetFileTime(FileTimeOptions which) const {
     if (which < kCreationTime || which > kLastWriteTime)
         TE_RAISE_ASSERTION("invalid FileTimeOptions", "PathBase::GetFileTime");
     platform::FileInfo info;
-    FileError error;
-    if (!platform::QueryFile(CStr(), info, error))
+    if (SystemError const error = platform::QueryFile(CStr(), info))
         TE_RAISE_FILE_ERROR(error, Describe("PATH_CANT_READ_INFO_1_2", error, CStr()),
                             "PathBase::GetFileTime");
     return info.times[which];
@@ -81,45 +88,39 @@ std::uint64_t PathBase::GetFileTime(FileTimeOptions which) const {
 void PathBase::SetFileTime(FileTimeOptions which, std::uint64_t fileTime) const {
     if (which < kCreationTime || which > kLastWriteTime)
         TE_RAISE_ASSERTION("invalid FileTimeOptions", "PathBase::SetFileTime");
-    FileError error;
-    if (!platform::SetFileTimeValue(CStr(), which, fileTime, error))
+    if (SystemError const error = platform::SetFileTimeValue(CStr(), which, fileTime))
         TE_RAISE_FILE_ERROR(error, Describe("PATH_CANT_CHANGE_1_2", error, CStr()),
                             "PathBase::SetFileTime");
 }
 
 void PathBase::SetReadOnly(bool readOnly) const {
-    FileError error;
-    if (!platform::SetFileReadOnly(CStr(), readOnly, error))
+    if (SystemError const error = platform::SetFileReadOnly(CStr(), readOnly))
         TE_RAISE_FILE_ERROR(error, Describe("PATH_CANT_CHANGE_1_2", error, CStr()),
                             "PathBase::SetReadOnly");
 }
 
 void PathBase::Delete() const {
-    FileError error;
-    if (!platform::RemoveFileOrDirectory(CStr(), error))
+    if (SystemError const error = platform::RemoveFileOrDirectory(CStr()))
         TE_RAISE_FILE_ERROR(error, Describe("PATH_CANT_DELETE_1_2", error, CStr()),
                             "PathBase::Delete");
 }
 
 void PathBase::CopyTo(PathBase const& destination, bool overwrite) const {
-    FileError error;
-    if (!platform::CopyRegularFile(CStr(), destination.CStr(), overwrite, error))
+    if (SystemError const error = platform::CopyRegularFile(CStr(), destination.CStr(), overwrite))
         TE_RAISE_FILE_ERROR(error,
                             Describe("PATH_CANT_COPY_1_2_3", error, CStr(), destination.CStr()),
                             "PathBase::CopyTo");
 }
 
 void PathBase::MoveTo(PathBase const& destination) const {
-    FileError error;
-    if (!platform::MoveFileOrDirectory(CStr(), destination.CStr(), false, error))
+    if (SystemError const error = platform::MoveFileOrDirectory(CStr(), destination.CStr(), false))
         TE_RAISE_FILE_ERROR(error,
                             Describe("PATH_CANT_MOVE_1_2_3", error, CStr(), destination.CStr()),
                             "PathBase::MoveTo");
 }
 
 void PathBase::MoveToReplacing(PathBase const& destination) const {
-    FileError error;
-    if (!platform::MoveFileOrDirectory(CStr(), destination.CStr(), true, error))
+    if (SystemError const error = platform::MoveFileOrDirectory(CStr(), destination.CStr(), true))
         TE_RAISE_FILE_ERROR(error,
                             Describe("PATH_CANT_MOVE_1_2_3", error, CStr(), destination.CStr()),
                             "PathBase::MoveToReplacing");
@@ -133,16 +134,14 @@ void PathBase::MakeBackupCopy(PathBase& backup) const {
 }
 
 void PathBase::MakeAllDirectoriesInPathNameLong() const {
-    FileError error;
-    if (!platform::MakeDirectories(CStr(), error))
+    if (SystemError const error = platform::MakeDirectories(CStr()))
         TE_RAISE_FILE_ERROR(error, Describe("PATH_CANT_CREATE_DIRECTORIES_1_2", error, CStr()),
                             "PathBase::MakeAllDirectoriesInPathNameLong");
 }
 
 long PathBase::FindFilesEx(PathSet& files, bool includeDirectories) const {
     std::vector<std::string> found;
-    FileError error;
-    if (!platform::ListMatchingFiles(CStr(), includeDirectories, found, error))
+    if (SystemError const error = platform::ListMatchingFiles(CStr(), includeDirectories, found))
         TE_RAISE_FILE_ERROR(error, Describe("PATH_CANT_LIST_FILES_1_2", error, CStr()),
                             "PathBase::FindFilesEx");
     for (std::string const& name : found)
@@ -152,8 +151,7 @@ long PathBase::FindFilesEx(PathSet& files, bool includeDirectories) const {
 
 void PathBase::CreateUniqueTempFile(char const* prefix, PathBase& created) const {
     std::string name;
-    FileError error;
-    if (!platform::CreateUniqueFile(CStr(), prefix ? prefix : "", name, error))
+    if (SystemError const error = platform::CreateUniqueFile(CStr(), prefix ? prefix : "", name))
         TE_RAISE_FILE_ERROR(error, Describe("PATH_CANT_CREATE_TEMP_FILE_1_2", error, CStr()),
                             "PathBase::CreateUniqueTempFile");
     created.SetPathName(name.c_str());

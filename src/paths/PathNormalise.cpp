@@ -2,7 +2,8 @@
 #include "tekit/paths/PathBase.h"
 
 #include "paths/PathRules.h"
-#include "platform/Platform.h"
+#include "platform/Environment.h"
+#include "platform/File.h"
 #include "tekit/paths/DynamicPath.h"
 
 #include <algorithm>

@@ -2,7 +2,6 @@
 #include "tekit/paths/PathBase.h"
 
 #include "paths/PathRules.h"
-#include "platform/Platform.h"
 
 #include <functional>
 #include <string>

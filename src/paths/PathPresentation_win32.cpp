@@ -2,7 +2,7 @@
 #include "tekit/paths/PathBase.h"
 
 #include "paths/PathRules.h"
-#include "platform/Platform.h"
+#include "platform/TextWidth.h"
 
 namespace tekit {
 

@@ -1,5 +1,5 @@
 // PathBase: the long-path form of a path as wide text, where there is no COM _bstr_t.
-#include "platform/Platform.h"
+#include "platform/TextConversion.h"
 #include "tekit/errors/Raise.h"
 #include "tekit/paths/PathBase.h"
 #include "tekit/strings/DynamicString.h"

@@ -1,4 +1,4 @@
-#include "platform/Platform.h"
+#include "platform/CodePage.h"
 
 namespace tekit::platform {
 

@@ -1,7 +1,8 @@
 // The two conversions behind _bstr_t's narrow-text members. MinGW-w64's comutil.h declares
 // them but ships no library that defines them (the role of comsupp on other toolchains), so the
 // library defines and exports them: callers that use _bstr_t with narrow text link through it.
-#include "platform/Platform.h"
+#include "platform/CodePage.h"
+#include "platform/TextConversion.h"
 #include "platform/Win32.h"
 
 #include <comutil.h>

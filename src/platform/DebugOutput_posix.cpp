@@ -1,4 +1,4 @@
-#include "platform/Platform.h"
+#include "platform/DebugOutput.h"
 
 #include <cstdio>
 

@@ -1,4 +1,4 @@
-#include "platform/Platform.h"
+#include "platform/Environment.h"
 
 #include <cstdlib>
 

@@ -1,4 +1,6 @@
-#include "platform/Platform.h"
+#include "platform/CodePage.h"
+#include "platform/ErrorInfo.h"
+#include "platform/TextConversion.h"
 #include "platform/Win32.h"
 
 #include <oleauto.h>

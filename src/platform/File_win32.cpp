@@ -1,66 +1,45 @@
-// Files on Windows: the ANSI file calls, and the wide long-path calls to create directories.
-#include "platform/Platform.h"
+// Files on Windows, one system call's worth each: the ANSI file calls, and the wide long-path
+// calls for the directories that MakeDirectories creates and removes again.
+#include "platform/Fault.h"
+#include "platform/File.h"
 #include "platform/Win32.h"
 
-#include "tekit/errors/TEError.h"
-
-#include <cstdio>
+#include <climits>
 
 namespace tekit::platform {
 
+char const kRenameFunction[] = "MoveFileExA";
+
 namespace {
 
-bool Fail(FileError& error, char const* apiFunction, DWORD code) {
-    error.code = Win32FileIOErrorToTEError(code);
-    error.apiFunction = apiFunction;
-    error.systemCode = static_cast<long>(code);
-    return false;
+/// Attributes a copy takes over from its source, as CopyFile does.
+constexpr DWORD kCopiedAttributes = FILE_ATTRIBUTE_READONLY | FILE_ATTRIBUTE_HIDDEN |
+                                    FILE_ATTRIBUTE_SYSTEM | FILE_ATTRIBUTE_ARCHIVE |
+                                    FILE_ATTRIBUTE_NOT_CONTENT_INDEXED;
+
+/// The failure of `apiFunction` that GetLastError describes.
+SystemError LastError(char const* apiFunction) {
+    DWORD const code = ::GetLastError();
+    return {apiFunction, static_cast<long>(code != 0 ? code : ERROR_GEN_FAILURE)};
 }
-bool FailWithLastError(FileError& error, char const* apiFunction) {
-    return Fail(error, apiFunction, ::GetLastError());
+
+HANDLE Handle(NativeFile file) {
+    return reinterpret_cast<HANDLE>(file);
+}
+
+NativeFile FromHandle(HANDLE handle) {
+    return reinterpret_cast<NativeFile>(handle);
 }
 
 std::uint64_t ToFileTime(FILETIME const& time) {
     return (std::uint64_t(time.dwHighDateTime) << 32) | time.dwLowDateTime;
 }
+
 FILETIME FromFileTime(std::uint64_t value) {
     FILETIME time;
     time.dwLowDateTime = DWORD(value & 0xFFFFFFFFu);
     time.dwHighDateTime = DWORD(value >> 32);
     return time;
-}
-
-bool IsSeparator(char c) {
-    return c == '\\' || c == '/';
-}
-
-/// The directory part of `path`: up to and including its last separator or ':', or "".
-std::string DirectoryOf(std::string const& path) {
-    size_t const end = path.find_last_of("\\/:");
-    return end == std::string::npos ? std::string() : path.substr(0, end + 1);
-}
-
-/// Attributes of `path`, or INVALID_FILE_ATTRIBUTES.
-DWORD AttributesOf(char const* path) {
-    return ::GetFileAttributesA(path);
-}
-
-/// Refuses what the file calls would half do: an existing destination when not replacing, and
-/// a read-only or directory destination.
-bool CheckDestination(char const* to, bool replace, char const* api, FileError& error) {
-    DWORD const attributes = AttributesOf(to);
-    if (attributes == INVALID_FILE_ATTRIBUTES)
-        return true;
-    if (!replace)
-        return Fail(error, api, ERROR_FILE_EXISTS);
-    if (attributes & (FILE_ATTRIBUTE_DIRECTORY | FILE_ATTRIBUTE_READONLY))
-        return Fail(error, api, ERROR_ACCESS_DENIED);
-    return true;
-}
-
-void DeleteTemporary(std::string const& path) {
-    ::SetFileAttributesA(path.c_str(), FILE_ATTRIBUTE_NORMAL);
-    ::DeleteFileA(path.c_str());
 }
 
 std::wstring Widen(std::string const& text) {
@@ -87,177 +66,194 @@ std::wstring LongForm(std::string text) {
     return Widen(text);
 }
 
-/// Index where the directories to create start: after "X:\" or "\\srv\share\".
-size_t FirstCreatedLevel(std::string const& text) {
-    if (text.size() >= 3 && text[1] == ':' && IsSeparator(text[2]))
-        return 3;
-    if (text.size() >= 2 && IsSeparator(text[0]) && IsSeparator(text[1])) {
-        size_t const machineEnd = text.find_first_of("\\/", 2);
-        size_t const shareEnd = machineEnd == std::string::npos
-                                    ? machineEnd
-                                    : text.find_first_of("\\/", machineEnd + 1);
-        return shareEnd == std::string::npos ? text.size() : shareEnd + 1;
-    }
-    return IsSeparator(text[0]) ? 1 : 0;
-}
-
-void RemoveMadeDirectories(std::vector<std::wstring> const& made) {
-    for (auto it = made.rbegin(); it != made.rend(); ++it)
-        ::RemoveDirectoryW(it->c_str());
-}
-
 } // namespace
 
-bool QueryFile(char const* path, FileInfo& info, FileError& error) {
+SystemError QueryFile(char const* path, FileInfo& info) {
+    if (SystemError const injected = InjectedFailure(FaultKind::Stat, "GetFileAttributesExA"))
+        return injected;
     WIN32_FILE_ATTRIBUTE_DATA data{};
     if (!::GetFileAttributesExA(path, GetFileExInfoStandard, &data))
-        return FailWithLastError(error, "GetFileAttributesExA");
+        return LastError("GetFileAttributesExA");
     info.isDirectory = (data.dwFileAttributes & FILE_ATTRIBUTE_DIRECTORY) != 0;
     info.isReadOnly = (data.dwFileAttributes & FILE_ATTRIBUTE_READONLY) != 0;
     info.size = (std::uint64_t(data.nFileSizeHigh) << 32) | data.nFileSizeLow;
     info.times[0] = ToFileTime(data.ftCreationTime);
     info.times[1] = ToFileTime(data.ftLastAccessTime);
     info.times[2] = ToFileTime(data.ftLastWriteTime);
-    return true;
+    return {};
 }
 
-bool SetFileTimeValue(char const* path, int which, std::uint64_t fileTime, FileError& error) {
+SystemError SetFileTimeValue(char const* path, int which, std::uint64_t fileTime) {
+    if (SystemError const injected = InjectedFailure(FaultKind::SetTimes, "SetFileTime"))
+        return injected;
     HANDLE const file = ::CreateFileA(path, FILE_WRITE_ATTRIBUTES,
                                       FILE_SHARE_READ | FILE_SHARE_WRITE | FILE_SHARE_DELETE,
                                       nullptr, OPEN_EXISTING, FILE_FLAG_BACKUP_SEMANTICS, nullptr);
     if (file == INVALID_HANDLE_VALUE)
-        return FailWithLastError(error, "CreateFileA");
+        return LastError("CreateFileA");
     FILETIME const time = FromFileTime(fileTime);
     BOOL const done = ::SetFileTime(file, which == 0 ? &time : nullptr,
                                     which == 1 ? &time : nullptr, which == 2 ? &time : nullptr);
-    DWORD const failure = ::GetLastError();
+    SystemError const error = done ? SystemError{} : LastError("SetFileTime");
     ::CloseHandle(file);
-    return done || Fail(error, "SetFileTime", failure);
+    return error;
 }
 
-bool SetFileReadOnly(char const* path, bool readOnly, FileError& error) {
-    DWORD const attributes = AttributesOf(path);
+SystemError SetFileReadOnly(char const* path, bool readOnly) {
+    if (SystemError const injected = InjectedFailure(FaultKind::Attributes, "SetFileAttributesA"))
+        return injected;
+    DWORD const attributes = ::GetFileAttributesA(path);
     if (attributes == INVALID_FILE_ATTRIBUTES)
-        return FailWithLastError(error, "GetFileAttributesA");
+        return LastError("GetFileAttributesA");
     DWORD changed = readOnly ? (attributes | FILE_ATTRIBUTE_READONLY)
                              : (attributes & ~DWORD(FILE_ATTRIBUTE_READONLY));
     if (changed == 0)
         changed = FILE_ATTRIBUTE_NORMAL;
-    return ::SetFileAttributesA(path, changed) || FailWithLastError(error, "SetFileAttributesA");
+    return ::SetFileAttributesA(path, changed) ? SystemError{} : LastError("SetFileAttributesA");
 }
 
-bool RemoveFileOrDirectory(char const* path, FileError& error) {
-    DWORD const attributes = AttributesOf(path);
+SystemError RemoveFileOrDirectory(char const* path) {
+    if (SystemError const injected = InjectedFailure(FaultKind::Delete, "DeleteFileA"))
+        return injected;
+    DWORD const attributes = ::GetFileAttributesA(path);
     if (attributes == INVALID_FILE_ATTRIBUTES)
-        return FailWithLastError(error, "GetFileAttributesA");
+        return LastError("GetFileAttributesA");
     if (attributes & FILE_ATTRIBUTE_DIRECTORY)
-        return ::RemoveDirectoryA(path) || FailWithLastError(error, "RemoveDirectoryA");
-    return ::DeleteFileA(path) || FailWithLastError(error, "DeleteFileA");
+        return ::RemoveDirectoryA(path) ? SystemError{} : LastError("RemoveDirectoryA");
+    return ::DeleteFileA(path) ? SystemError{} : LastError("DeleteFileA");
 }
 
-bool CopyRegularFile(char const* from, char const* to, bool overwrite, FileError& error) {
-    if (AttributesOf(from) == INVALID_FILE_ATTRIBUTES)
-        return FailWithLastError(error, "CopyFileA");
-    if (!CheckDestination(to, overwrite, "CopyFileA", error))
-        return false;
-    std::string directory = DirectoryOf(to);
-    char temporary[MAX_PATH + 1] = {};
-    if (!::GetTempFileNameA(directory.empty() ? "." : directory.c_str(), "tkc", 0, temporary))
-        return FailWithLastError(error, "GetTempFileNameA");
-    if (!::CopyFileA(from, temporary, FALSE)) {
-        DWORD const failure = ::GetLastError();
-        DeleteTemporary(temporary);
-        return Fail(error, "CopyFileA", failure);
+SystemError RemoveEmptyDirectory(char const* path) {
+    if (SystemError const injected = InjectedFailure(FaultKind::Delete, "RemoveDirectoryW"))
+        return injected;
+    return ::RemoveDirectoryW(LongForm(path).c_str()) ? SystemError{}
+                                                      : LastError("RemoveDirectoryW");
+}
+
+SystemError RenameFile(char const* from, char const* to, bool replace) {
+    if (SystemError const injected = InjectedFailure(FaultKind::Rename, "MoveFileExA"))
+        return injected;
+    // No MOVEFILE_COPY_ALLOWED: a move across volumes is generic code's to do.
+    DWORD const flags = replace ? MOVEFILE_REPLACE_EXISTING : 0;
+    return ::MoveFileExA(from, to, flags) ? SystemError{} : LastError("MoveFileExA");
+}
+
+SystemError MakeDirectory(char const* path, bool& created) {
+    created = false;
+    if (SystemError const injected =
+            InjectedFailure(FaultKind::DirectoryCreate, "CreateDirectoryW"))
+        return injected;
+    std::wstring const wide = LongForm(path);
+    if (::CreateDirectoryW(wide.c_str(), nullptr)) {
+        created = true;
+        return {};
     }
-    if (::MoveFileExA(temporary, to, overwrite ? MOVEFILE_REPLACE_EXISTING : 0))
-        return true;
-    DWORD const failure = ::GetLastError();
-    DeleteTemporary(temporary);
-    return Fail(error, "MoveFileExA", failure);
+    SystemError const error = LastError("CreateDirectoryW");
+    DWORD const attributes = ::GetFileAttributesW(wide.c_str());
+    if (error.code == ERROR_ALREADY_EXISTS && attributes != INVALID_FILE_ATTRIBUTES &&
+        (attributes & FILE_ATTRIBUTE_DIRECTORY))
+        return {};
+    return error;
 }
 
-bool MoveFileOrDirectory(char const* from, char const* to, bool replace, FileError& error) {
-    if (AttributesOf(from) == INVALID_FILE_ATTRIBUTES)
-        return FailWithLastError(error, "MoveFileExA");
-    if (!CheckDestination(to, replace, "MoveFileExA", error))
-        return false;
-    DWORD const flags = MOVEFILE_COPY_ALLOWED | (replace ? MOVEFILE_REPLACE_EXISTING : 0);
-    return ::MoveFileExA(from, to, flags) || FailWithLastError(error, "MoveFileExA");
-}
-
-bool MakeDirectories(char const* path, FileError& error) {
-    std::string const text = path;
-    if (text.empty())
-        return Fail(error, "CreateDirectoryW", ERROR_PATH_NOT_FOUND);
-    std::vector<std::wstring> made;
-    for (size_t end = FirstCreatedLevel(text); end < text.size();) {
-        size_t const separator = text.find_first_of("\\/", end);
-        end = separator == std::string::npos ? text.size() : separator + 1;
-        std::string const prefix = text.substr(0, separator == std::string::npos ? end : separator);
-        if (prefix.empty() || IsSeparator(prefix.back()))
-            continue;
-        std::wstring const wide = LongForm(prefix);
-        if (::CreateDirectoryW(wide.c_str(), nullptr)) {
-            made.push_back(wide);
-            continue;
-        }
-        DWORD const failure = ::GetLastError();
-        DWORD const attributes = ::GetFileAttributesW(wide.c_str());
-        if (failure == ERROR_ALREADY_EXISTS && attributes != INVALID_FILE_ATTRIBUTES &&
-            (attributes & FILE_ATTRIBUTE_DIRECTORY))
-            continue;
-        RemoveMadeDirectories(made);
-        return Fail(error, "CreateDirectoryW", failure);
-    }
-    return true;
-}
-
-bool ListMatchingFiles(char const* pattern, bool includeDirectories,
-                       std::vector<std::string>& paths, FileError& error) {
-    std::string const directory = DirectoryOf(pattern);
+SystemError ListDirectory(std::string const& directory, std::vector<DirectoryEntry>& entries) {
+    if (SystemError const injected = InjectedFailure(FaultKind::DirectoryList, "FindFirstFileA"))
+        return injected;
     WIN32_FIND_DATAA data{};
-    HANDLE const search = ::FindFirstFileA(pattern, &data);
+    HANDLE const search = ::FindFirstFileA((directory + "*").c_str(), &data);
     if (search == INVALID_HANDLE_VALUE) {
-        DWORD const failure = ::GetLastError();
-        if (failure == ERROR_FILE_NOT_FOUND || failure == ERROR_NO_MORE_FILES)
-            return true;
-        return Fail(error, "FindFirstFileA", failure);
+        SystemError const error = LastError("FindFirstFileA");
+        bool const empty = error.code == ERROR_FILE_NOT_FOUND || error.code == ERROR_NO_MORE_FILES;
+        return empty ? SystemError{} : error;
     }
     do {
-        std::string const name = data.cFileName;
-        bool const isDirectory = (data.dwFileAttributes & FILE_ATTRIBUTE_DIRECTORY) != 0;
-        if (name != "." && name != ".." && (!isDirectory || includeDirectories))
-            paths.push_back(directory + name);
+        std::string name = data.cFileName;
+        if (name != "." && name != "..")
+            entries.push_back(
+                {std::move(name), (data.dwFileAttributes & FILE_ATTRIBUTE_DIRECTORY) != 0});
     } while (::FindNextFileA(search, &data));
-    DWORD const failure = ::GetLastError();
+    SystemError const error = LastError("FindNextFileA");
     ::FindClose(search);
-    return failure == ERROR_NO_MORE_FILES || Fail(error, "FindNextFileA", failure);
+    return error.code == ERROR_NO_MORE_FILES ? SystemError{} : error;
 }
 
-bool CreateUniqueFile(char const* target, char const* prefix, std::string& created,
-                      FileError& error) {
-    std::string const text = target;
-    std::string const directory =
-        !text.empty() && IsSeparator(text.back()) ? text : DirectoryOf(text);
-    // Six hex digits from a per-process start, tried in turn as GetTempFileNameA does.
-    DWORD const start = (::GetTickCount() ^ (::GetCurrentProcessId() << 8)) & 0xFFFFFF;
-    for (DWORD attempt = 0; attempt < 0x1000000; ++attempt) {
-        char suffix[16];
-        std::snprintf(suffix, sizeof suffix, "%06lX.tmp",
-                      static_cast<unsigned long>((start + attempt) & 0xFFFFFF));
-        std::string const name = directory + prefix + suffix;
-        HANDLE const file = ::CreateFileA(name.c_str(), GENERIC_WRITE, 0, nullptr, CREATE_NEW,
-                                          FILE_ATTRIBUTE_NORMAL, nullptr);
-        if (file != INVALID_HANDLE_VALUE) {
-            ::CloseHandle(file);
-            created = name;
-            return true;
-        }
-        DWORD const failure = ::GetLastError();
-        if (failure != ERROR_FILE_EXISTS && failure != ERROR_ALREADY_EXISTS)
-            return Fail(error, "CreateFileA", failure);
+SystemError OpenFileForReading(char const* path, NativeFile& file) {
+    if (SystemError const injected = InjectedFailure(FaultKind::Open, "CreateFileA"))
+        return injected;
+    HANDLE const handle = ::CreateFileA(path, GENERIC_READ, FILE_SHARE_READ, nullptr, OPEN_EXISTING,
+                                        FILE_ATTRIBUTE_NORMAL | FILE_FLAG_SEQUENTIAL_SCAN, nullptr);
+    if (handle == INVALID_HANDLE_VALUE)
+        return LastError("CreateFileA");
+    file = FromHandle(handle);
+    return {};
+}
+
+SystemError CreateTemporaryFile(char const* path, NativeFile& file) {
+    if (SystemError const injected = InjectedFailure(FaultKind::TemporaryFile, "CreateFileA"))
+        return injected;
+    HANDLE const handle =
+        ::CreateFileA(path, GENERIC_WRITE, 0, nullptr, CREATE_NEW, FILE_ATTRIBUTE_NORMAL, nullptr);
+    if (handle == INVALID_HANDLE_VALUE)
+        return LastError("CreateFileA");
+    file = FromHandle(handle);
+    return {};
+}
+
+SystemError ReadFromFile(NativeFile file, void* buffer, std::size_t size, std::size_t& count) {
+    if (SystemError const injected = InjectedFailure(FaultKind::Read, "ReadFile"))
+        return injected;
+    DWORD got = 0;
+    DWORD const wanted = size > MAXDWORD ? MAXDWORD : static_cast<DWORD>(size);
+    if (!::ReadFile(Handle(file), buffer, wanted, &got, nullptr))
+        return LastError("ReadFile");
+    count = got;
+    return {};
+}
+
+SystemError WriteToFile(NativeFile file, void const* data, std::size_t size) {
+    if (SystemError const injected = InjectedFailure(FaultKind::Write, "WriteFile"))
+        return injected;
+    auto const* bytes = static_cast<char const*>(data);
+    while (size > 0) {
+        DWORD const chunk = size > MAXDWORD ? MAXDWORD : static_cast<DWORD>(size);
+        DWORD written = 0;
+        if (!::WriteFile(Handle(file), bytes, chunk, &written, nullptr))
+            return LastError("WriteFile");
+        if (written == 0)
+            return {"WriteFile", ERROR_DISK_FULL};
+        bytes += written;
+        size -= written;
     }
-    return Fail(error, "CreateFileA", ERROR_FILE_EXISTS);
+    return {};
+}
+
+SystemError FlushFile(NativeFile file) {
+    if (SystemError const injected = InjectedFailure(FaultKind::Flush, "FlushFileBuffers"))
+        return injected;
+    return ::FlushFileBuffers(Handle(file)) ? SystemError{} : LastError("FlushFileBuffers");
+}
+
+SystemError CopyFileAttributes(NativeFile from, NativeFile to) {
+    if (SystemError const injected =
+            InjectedFailure(FaultKind::Attributes, "SetFileInformationByHandle"))
+        return injected;
+    FILE_BASIC_INFO info{};
+    if (!::GetFileInformationByHandleEx(Handle(from), FileBasicInfo, &info, sizeof info))
+        return LastError("GetFileInformationByHandleEx");
+    info.CreationTime.QuadPart = 0; // 0: left as it is
+    info.ChangeTime.QuadPart = 0;
+    info.FileAttributes &= kCopiedAttributes;
+    return ::SetFileInformationByHandle(Handle(to), FileBasicInfo, &info, sizeof info)
+               ? SystemError{}
+               : LastError("SetFileInformationByHandle");
+}
+
+SystemError CloseFile(NativeFile file) {
+    // The handle is gone after CloseHandle whatever it reports, an injected failure included.
+    SystemError const injected = InjectedFailure(FaultKind::Close, "CloseHandle");
+    if (!::CloseHandle(Handle(file)) && !injected)
+        return LastError("CloseHandle");
+    return injected;
 }
 
 bool CurrentDirectory(std::string& directory) {
@@ -280,6 +276,8 @@ bool ModuleFileName(HINSTANCE module, std::string& path) {
 }
 
 bool SameExistingFile(char const* a, char const* b) {
+    if (InjectedFailure(FaultKind::Stat, "GetLongPathNameA"))
+        return false;
     char fullA[1024], fullB[1024], longA[1024], longB[1024];
     if (!::GetFullPathNameA(a, sizeof fullA, fullA, nullptr) ||
         !::GetFullPathNameA(b, sizeof fullB, fullB, nullptr))
@@ -292,6 +290,8 @@ bool SameExistingFile(char const* a, char const* b) {
 }
 
 bool StoredFileName(char const* path, std::string& name) {
+    if (InjectedFailure(FaultKind::Stat, "FindFirstFileA"))
+        return false;
     WIN32_FIND_DATAA data{};
     HANDLE const search = ::FindFirstFileA(path, &data);
     if (search == INVALID_HANDLE_VALUE)

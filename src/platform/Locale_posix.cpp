@@ -1,6 +1,7 @@
 // The user's decimal separator, read from the locale that the environment names, without
 // touching the process's own locale.
-#include "platform/Platform.h"
+#include "platform/Environment.h"
+#include "platform/Locale.h"
 
 #include <langinfo.h>
 #include <locale.h>

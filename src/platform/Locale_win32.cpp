@@ -1,5 +1,5 @@
 // The user's decimal separator, from the regional settings rather than the C runtime's locale.
-#include "platform/Platform.h"
+#include "platform/Locale.h"
 #include "platform/Win32.h"
 
 namespace tekit::platform {

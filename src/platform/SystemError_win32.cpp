@@ -1,4 +1,5 @@
-#include "platform/Platform.h"
+// FormatMessage texts; errno values are already in the C runtime's numbering here.
+#include "platform/SystemError.h"
 #include "platform/Win32.h"
 
 #include <cstdio>
@@ -32,6 +33,11 @@ std::string SystemErrorMessage(unsigned code) {
     if (length == 0)
         return GenericMessage(code);
     return std::string(buffer, length);
+}
+
+int NativeErrnoToCrtErrno(int nativeErrno) {
+    // The C runtime's own numbering is the one error conversions are written against.
+    return nativeErrno;
 }
 
 } // namespace tekit::platform

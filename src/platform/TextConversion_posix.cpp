@@ -1,13 +1,10 @@
-// Narrow <-> wide text on POSIX: code page 0 is Latin-1 (each byte its own code point); the
-// Windows code pages go through iconv as "CP<n>" (glibc knows CP932, CP936, CP949, CP950,
-// CP1252, ...). wchar_t is UTF-32 here. A code page that iconv does not know is taken as
-// Latin-1, so a conversion never fails as a whole.
-#include "platform/Platform.h"
+// The system's conversion on POSIX: the Windows code pages go through iconv as "CP<n>" (glibc
+// knows CP932, CP936, CP949, CP950, CP1252, ...). wchar_t is UTF-32 here.
+#include "platform/TextConversion.h"
 
 #include <algorithm>
 #include <cerrno>
 #include <cstring>
-#include <cwchar>
 #include <iconv.h>
 #include <string>
 
@@ -16,34 +13,6 @@ namespace tekit::platform {
 namespace {
 
 constexpr wchar_t kReplacement = 0xFFFD;
-
-int ResolveLength(char const* text, int numBytes) {
-    if (!text)
-        return 0;
-    return numBytes < 0 ? static_cast<int>(std::strlen(text)) : numBytes;
-}
-
-int ResolveLength(wchar_t const* text, int numChars) {
-    if (!text)
-        return 0;
-    return numChars < 0 ? static_cast<int>(std::wcslen(text)) : numChars;
-}
-
-std::wstring Latin1ToWide(char const* text, int length) {
-    std::wstring out(size_t(length), L'\0');
-    for (int i = 0; i < length; ++i)
-        out[size_t(i)] = static_cast<wchar_t>(static_cast<unsigned char>(text[i]));
-    return out;
-}
-
-std::string WideToLatin1(wchar_t const* text, int length) {
-    std::string out(size_t(length), '\0');
-    for (int i = 0; i < length; ++i) {
-        auto const c = static_cast<std::uint32_t>(text[i]);
-        out[size_t(i)] = c <= 0xFF ? static_cast<char>(c) : '?';
-    }
-    return out;
-}
 
 /// An iconv descriptor that closes itself.
 class Converter {
@@ -97,35 +66,21 @@ std::string CodePageName(unsigned codePage) {
 
 } // namespace
 
-std::wstring NarrowToWide(char const* text, int numBytes, unsigned codePage) {
-    int const length = ResolveLength(text, numBytes);
-    if (length <= 0)
-        return {};
-    if (codePage != 0) {
-        Converter converter("WCHAR_T", CodePageName(codePage).c_str());
-        if (converter.Valid()) {
-            std::wstring out;
-            converter.Run(text, size_t(length), out, 1, kReplacement);
-            return out;
-        }
-    }
-    return Latin1ToWide(text, length);
+bool SystemNarrowToWide(char const* text, int length, unsigned codePage, std::wstring& out) {
+    Converter converter("WCHAR_T", CodePageName(codePage).c_str());
+    if (!converter.Valid())
+        return false;
+    converter.Run(text, size_t(length), out, 1, kReplacement);
+    return true;
 }
 
-std::string WideToNarrow(wchar_t const* text, int numChars, unsigned codePage) {
-    int const length = ResolveLength(text, numChars);
-    if (length <= 0)
-        return {};
-    if (codePage != 0) {
-        Converter converter(CodePageName(codePage).c_str(), "WCHAR_T");
-        if (converter.Valid()) {
-            std::string out;
-            converter.Run(reinterpret_cast<char const*>(text), size_t(length) * sizeof(wchar_t),
-                          out, sizeof(wchar_t), '?');
-            return out;
-        }
-    }
-    return WideToLatin1(text, length);
+bool SystemWideToNarrow(wchar_t const* text, int length, unsigned codePage, std::string& out) {
+    Converter converter(CodePageName(codePage).c_str(), "WCHAR_T");
+    if (!converter.Valid())
+        return false;
+    converter.Run(reinterpret_cast<char const*>(text), size_t(length) * sizeof(wchar_t), out,
+                  sizeof(wchar_t), '?');
+    return true;
 }
 
 } // namespace tekit::platform

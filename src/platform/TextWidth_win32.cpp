@@ -1,5 +1,5 @@
 // Pixel widths of text, for fitting a path into a window.
-#include "platform/Platform.h"
+#include "platform/TextWidth.h"
 #include "platform/Win32.h"
 
 namespace tekit::platform {

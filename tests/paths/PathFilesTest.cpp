@@ -1,18 +1,24 @@
 // File operations against a real temporary directory. Paths are written in the host's form
 // (the library hands them to the system unchanged).
 #include "PathTestSupport.h"
+#include "support/FaultInjection.h"
 #include "tekit/paths/DynamicPath.h"
 #include "tekit/paths/Path.h"
 
 #include <cerrno>
 #include <filesystem>
 #include <fstream>
+#include <functional>
 #include <random>
 #include <sstream>
 #include <string>
 
 using namespace tekit;
 using tekit::testing::Caught;
+using tekit::testing::FaultKind;
+using tekit::testing::Raised;
+using tekit::testing::ScopedFault;
+namespace native = tekit::platform::native;
 namespace fs = std::filesystem;
 
 namespace {
@@ -339,4 +345,173 @@ TEST(PathProcess, CurrentDirectoryAndProgramFileExist) {
     program.SetUsingGetModuleFileName(nullptr);
     EXPECT_TRUE(program.Exists());
     EXPECT_NE(std::string(program.CStr()).find("paths_tests"), std::string::npos) << program.CStr();
+}
+
+// ---- Failures injected through the fault seam ---------------------------------------------
+
+TEST_F(PathFiles, FullDiskDuringACopyLeavesTheTargetAsItWas) {
+    Write("source.txt", "new contents");
+    DynamicPath const source(At("source.txt").c_str());
+    DynamicPath const target(At("target.txt").c_str());
+    std::string const description = "Could not copy " + Quoted(At("source.txt")) + " to " +
+                                    Quoted(At("target.txt")) + ". The disk is full.";
+    for (bool const targetExists : {false, true}) {
+        SCOPED_TRACE(targetExists ? "overwriting" : "new target");
+        if (targetExists)
+            Write("target.txt", "old contents");
+        size_t const entries = NumEntries();
+        ScopedFault const full(FaultKind::Write, 1, native::kDiskFull);
+        TEException const e = Raised([&] { source.CopyTo(target, true); });
+        EXPECT_EQ(e.GetErrorCode(), TE_DISK_FULL);
+        EXPECT_STREQ(e.GetFunctionName(), "PathBase::CopyTo");
+        EXPECT_EQ(std::string(e.GetDescription()), description);
+        EXPECT_EQ(e.GetAPIErrorCode(), native::kDiskFull);
+        EXPECT_EQ(Has("target.txt"), targetExists);
+        if (targetExists) {
+            EXPECT_EQ(Read("target.txt"), "old contents");
+        }
+        EXPECT_EQ(NumEntries(), entries); // no temporary file left behind
+    }
+}
+
+TEST_F(PathFiles, FailedTemporaryFileStopsTheCopyBeforeAnythingIsWritten) {
+    Write("source.txt", "contents");
+    ScopedFault const denied(FaultKind::TemporaryFile, 1, native::kAccessDenied);
+    EXPECT_RAISES_IN(
+        DynamicPath(At("source.txt").c_str()).CopyTo(DynamicPath(At("t.txt").c_str()), false),
+        TE_ACCESS_DENIED, "PathBase::CopyTo");
+    EXPECT_TRUE(denied.Fired());
+    EXPECT_FALSE(Has("t.txt"));
+    EXPECT_EQ(NumEntries(), 1u);
+}
+
+TEST_F(PathFiles, AccessDeniedOnDeleteKeepsTheFile) {
+    Write("busy.txt", "x");
+    ScopedFault const denied(FaultKind::Delete, 1, native::kAccessDenied);
+    EXPECT_RAISES_IN(DynamicPath(At("busy.txt").c_str()).Delete(), TE_ACCESS_DENIED,
+                     "PathBase::Delete",
+                     ("Could not delete " + Quoted(At("busy.txt")) + ". Access denied.").c_str());
+    EXPECT_EQ(Read("busy.txt"), "x");
+}
+
+TEST_F(PathFiles, FailedRenameDuringAMoveKeepsSourceAndTarget) {
+    Write("a.txt", "A");
+    Write("b.txt", "B");
+    DynamicPath const a(At("a.txt").c_str());
+    std::string const fresh =
+        "Could not move " + Quoted(At("a.txt")) + " to " + Quoted(At("c.txt")) + ". Access denied.";
+    {
+        ScopedFault const denied(FaultKind::Rename, 1, native::kAccessDenied);
+        EXPECT_RAISES_IN(a.MoveTo(DynamicPath(At("c.txt").c_str())), TE_ACCESS_DENIED,
+                         "PathBase::MoveTo", fresh.c_str());
+    }
+    {
+        ScopedFault const denied(FaultKind::Rename, 1, native::kAccessDenied);
+        EXPECT_RAISES_IN(a.MoveToReplacing(DynamicPath(At("b.txt").c_str())), TE_ACCESS_DENIED,
+                         "PathBase::MoveToReplacing");
+    }
+    EXPECT_EQ(Read("a.txt"), "A");
+    EXPECT_EQ(Read("b.txt"), "B");
+    EXPECT_FALSE(Has("c.txt"));
+}
+
+// Whichever call of a copy or a move fails, the operation is all or nothing: it raises the
+// injected error and leaves both files as they were, or it is complete.
+TEST_F(PathFiles, AnyFailedCallLeavesACopyOrMoveAllOrNothing) {
+    FaultKind const kinds[] = {FaultKind::Open,  FaultKind::Stat,  FaultKind::TemporaryFile,
+                               FaultKind::Read,  FaultKind::Write, FaultKind::Attributes,
+                               FaultKind::Flush, FaultKind::Close, FaultKind::Rename,
+                               FaultKind::Delete};
+    DynamicPath const source(At("source.txt").c_str());
+    DynamicPath const target(At("target.txt").c_str());
+    auto const reset = [&] {
+        fs::remove(At("source.txt"));
+        Write("source.txt", "new");
+        Write("target.txt", "old");
+    };
+    struct Operation {
+        char const* name;
+        std::function<void()> run;
+        bool keepsSource;
+    };
+    Operation const operations[] = {
+        {"copy", [&] { source.CopyTo(target, true); }, true},
+        {"move", [&] { source.MoveToReplacing(target); }, false},
+    };
+    for (Operation const& operation : operations) {
+        for (FaultKind const kind : kinds) {
+            reset();
+            std::uint32_t calls = 0;
+            {
+                ScopedFault const counter(kind, ScopedFault::kCountOnly);
+                operation.run();
+                calls = counter.Calls();
+            }
+            for (std::uint32_t nth = 1; nth <= calls; ++nth) {
+                SCOPED_TRACE(::testing::Message() << operation.name << ", kind "
+                                                  << static_cast<int>(kind) << ", call " << nth);
+                reset();
+                ScopedFault const fault(kind, nth, native::kAccessDenied);
+                bool raised = false;
+                try {
+                    operation.run();
+                } catch (TEException const& e) {
+                    raised = true;
+                    EXPECT_EQ(e.GetErrorCode(), TE_ACCESS_DENIED);
+                }
+                EXPECT_EQ(Read("target.txt"), raised ? "old" : "new");
+                EXPECT_EQ(Has("source.txt"), raised || operation.keepsSource);
+                if (Has("source.txt")) {
+                    EXPECT_EQ(Read("source.txt"), "new");
+                }
+                EXPECT_EQ(NumEntries(), Has("source.txt") ? 2u : 1u);
+            }
+        }
+    }
+}
+
+TEST_F(PathFiles, DirectoriesMadeBeforeAFailedLevelAreRemovedAgain) {
+    auto const nested = [&](char const* prefix) {
+        return At(prefix + std::string("1") + kHostSeparator + prefix + "2" + kHostSeparator +
+                  prefix + "3");
+    };
+    std::uint32_t levels = 0; // the existing levels above the test directory count too
+    {
+        ScopedFault const counter(FaultKind::DirectoryCreate, ScopedFault::kCountOnly);
+        DynamicPath(nested("m").c_str()).MakeAllDirectoriesInPathNameLong();
+        levels = counter.Calls();
+    }
+    ASSERT_GE(levels, 3u);
+    DynamicPath const path(nested("n").c_str());
+    for (std::uint32_t level = 1; level <= levels; ++level) {
+        SCOPED_TRACE(::testing::Message() << "level " << level);
+        ScopedFault const full(FaultKind::DirectoryCreate, level, native::kDiskFull);
+        EXPECT_RAISES_IN(path.MakeAllDirectoriesInPathNameLong(), TE_DISK_FULL,
+                         "PathBase::MakeAllDirectoriesInPathNameLong");
+        EXPECT_FALSE(Has("n1"));
+    }
+    ScopedFault const denied(FaultKind::Delete, 1, native::kAccessDenied);
+    ScopedFault const full(FaultKind::DirectoryCreate, levels - 1, native::kDiskFull);
+    EXPECT_RAISES(path.MakeAllDirectoriesInPathNameLong(), TE_DISK_FULL); // the first error
+    EXPECT_TRUE(Has("n1"));                                               // its removal failed
+}
+
+TEST_F(PathFiles, AMoveAcrossVolumesCopiesThenRemovesTheSource) {
+    Write("a.txt", "A");
+    DynamicPath const a(At("a.txt").c_str());
+    {
+        ScopedFault const otherVolume(FaultKind::Rename, 1, native::kCrossDevice);
+        a.MoveTo(DynamicPath(At("b.txt").c_str()));
+    }
+    EXPECT_FALSE(Has("a.txt"));
+    EXPECT_EQ(Read("b.txt"), "A");
+
+    // The source cannot be removed: the copy goes again and the source stays.
+    Write("a.txt", "A");
+    ScopedFault const otherVolume(FaultKind::Rename, 1, native::kCrossDevice);
+    ScopedFault const denied(FaultKind::Delete, 1, native::kAccessDenied);
+    EXPECT_RAISES_IN(a.MoveTo(DynamicPath(At("c.txt").c_str())), TE_ACCESS_DENIED,
+                     "PathBase::MoveTo");
+    EXPECT_EQ(Read("a.txt"), "A");
+    EXPECT_FALSE(Has("c.txt"));
 }

@@ -1,5 +1,10 @@
 // The operating-system seam: the same observable behaviour from each platform's implementation.
-#include "platform/Platform.h"
+#include "platform/CodePage.h"
+#include "platform/Environment.h"
+#include "platform/ErrorInfo.h"
+#include "platform/SystemError.h"
+#include "platform/TextConversion.h"
+#include "platform/Thread.h"
 
 #include <gtest/gtest.h>
 
