@@ -18,8 +18,19 @@ constexpr MessageRow kTEErrors[] = {
 #include "tekit/errors/TEError.def"
     {"USER_DEFINED_ERR_CODE", "User-defined error code."},
 };
+/// "ERR_DESCR": the error descriptions, then the pattern engine's messages under their keys
+/// and the text of its codes not listed.
 constexpr MessageRow kErrDescr[] = {
 #include "catalogue/ERR_DESCR.inc"
+#define REGEXPR_STATUS(symbol, value, key, text) TEKIT_STATUS_MESSAGE(key, text)
+#include "tekit/errors/RegExprStatus.def"
+    {"REGEXPR_UnknownError", "Unknown Error"},
+};
+/// "CRX_TOOLERR": the toolbox's own section holds the pattern engine's rows as well.
+constexpr MessageRow kToolErrors[] = {
+#define REGEXPR_STATUS(symbol, value, key, text) TEKIT_STATUS_MESSAGE(key, text)
+#include "tekit/errors/RegExprStatus.def"
+    {"REGEXPR_UnknownError", "Unknown Error"},
 };
 
 template <int N> constexpr MessageSection Section(char const* name, MessageRow const (&rows)[N]) {
@@ -30,6 +41,7 @@ constexpr MessageSection kSections[] = {
     Section("ERRORS", kErrors),
     Section("TE_ERRORS", kTEErrors),
     Section("ERR_DESCR", kErrDescr),
+    Section("CRX_TOOLERR", kToolErrors), // the toolbox's pattern engine
     {nullptr, nullptr, 0},
 };
 

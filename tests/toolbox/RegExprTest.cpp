@@ -342,7 +342,10 @@ TEST(RegExprTest, EveryCodeHasAKeyAndACatalogueText) {
         EXPECT_EQ(std::strstr(text, "%1") != nullptr, row.takesArgument == 1) << key;
     }
     EXPECT_STREQ(RegExpr_GetOVErrorDescTag(-7902, nullptr), "REGEXPR_EndWithBackslash");
-    EXPECT_STREQ(RString("CRX_TOOLERR", "REGEXPR_EndWithBackslash"), "Cannot end with '\\'");
+    // The texts are kept byte for byte: two backslashes where the message quotes the escape.
+    EXPECT_STREQ(RString("CRX_TOOLERR", "REGEXPR_EndWithBackslash"), "Cannot end with '\\\\'");
+    EXPECT_STREQ(RString("ERR_DESCR", "REGEXPR_InvalidHexValue"),
+                 "Invalid hex value following '\\\\x'");
 }
 
 TEST(RegExprTest, ValidityCheckReportsTheCode) {
