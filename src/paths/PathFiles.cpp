@@ -1,6 +1,7 @@
 // PathBase: operations on the file or directory a path names, through the platform layer.
 #include "tekit/paths/PathBase.h"
 
+#include "errors/NativeError.h"
 #include "paths/PathRules.h"
 #include "platform/File.h"
 #include "platform/SystemError.h"
@@ -21,13 +22,7 @@ namespace {
 /// The TEError of a native error: errno through the C runtime's numbering, Win32 codes as
 /// file errors. ENOTSUP has no row in the runtime's errno table and says what it means.
 TEError ToTEError(SystemError const& error) {
-#if defined(_WIN32)
-    return Win32FileIOErrorToTEError(static_cast<unsigned>(error.code));
-#else
-    if (error.code == platform::native::kNotSupported)
-        return TE_NOT_SUPPORTED;
-    return ErrnoToTEError(platform::NativeErrnoToCrtErrno(static_cast<int>(error.code)));
-#endif
+    return detail::NativeErrorToTEError(error, TE_IO_ERROR);
 }
 
 /// The "ERR_DESCR" message `key` with the paths as its first placeholders and the system's

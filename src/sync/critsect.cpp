@@ -8,6 +8,7 @@
 #include "tekit/sync/LockPools.h"
 #include "tekit/sync/Mutex.h"
 
+#include "errors/NativeError.h"
 #include "platform/Sync.h"
 #include "platform/SystemError.h"
 #include "platform/Thread.h"
@@ -145,14 +146,10 @@ void SetInterlockDisabled(bool) {}
 
 namespace {
 
-/// The TEError of a failed system call: Win32 codes as the error table maps them, errno
-/// values through the C runtime's numbering.
+/// The TEError of a failed system call; a Win32 code the error table does not know is an
+/// operating-system failure.
 TEError SystemErrorToTEError(platform::SystemError const& error) {
-#if defined(_WIN32)
-    return SystemErrorCodeToTEError(static_cast<unsigned>(error.code), TE_OS_EXCEPTION);
-#else
-    return ErrnoToTEError(platform::NativeErrnoToCrtErrno(static_cast<int>(error.code)));
-#endif
+    return detail::NativeErrorToTEError(error, TE_OS_EXCEPTION);
 }
 
 } // namespace
