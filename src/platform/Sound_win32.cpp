@@ -1,0 +1,14 @@
+#include "platform/Sound.h"
+#include "platform/Win32.h"
+
+namespace tekit::platform {
+
+bool PlayAlertSound() {
+    return ::MessageBeep(MB_OK) != FALSE;
+}
+
+bool PlayTone(unsigned frequency, unsigned milliseconds) {
+    return ::Beep(frequency, milliseconds) != FALSE;
+}
+
+} // namespace tekit::platform

@@ -1,0 +1,101 @@
+#include "tekit/toolbox/Compare.h"
+#include "tekit/toolbox/CompareFunction.h"
+
+#include <gtest/gtest.h>
+
+#include <cmath>
+#include <cstdint>
+#include <limits>
+#include <type_traits>
+
+namespace {
+
+constexpr double kNaN = std::numeric_limits<double>::quiet_NaN();
+
+struct Case {
+    double a, b;
+    int eq, gt, ge, lt, le, compare;
+};
+
+// Each row pins all six functions on one pair: the asymmetries show as rows that differ only
+// in the order of a and b.
+TEST(TolerantCompare, KeepsTheDocumentedAsymmetries) {
+    Case const cases[] = {
+        // Near zero: the relative test divides by b only.
+        {0.0, 5e-9, 0, 0, 0, 1, 1, -1},
+        {5e-9, 0.0, 1, 1, 1, 0, 0, 0},
+        // Relatively equal, absolutely too far apart.
+        {1e9, 1e9 + 1e-3, 0, 0, 0, 1, 1, -1},
+        // Differing signs compare plainly.
+        {-1.0, 1.0, 0, 0, 0, 1, 1, -1},
+        {1.0, -1.0, 0, 1, 1, 0, 0, 1},
+        // Close values of one sign decide by the relative difference.
+        {1.0 + 1e-9, 1.0, 1, 0, 1, 0, 1, 0},
+        {-1.0 - 1e-9, -1.0, 1, 0, 1, 0, 1, 0},
+        {1.0 + 2e-8, 1.0, 0, 1, 1, 0, 0, 1},
+        {-1.0, -1.0 - 2e-8, 0, 1, 1, 0, 0, 1},
+        {2.0, 2.0, 1, 0, 1, 0, 1, 0},
+        // Tiny numbers of different size are not equal.
+        {1e-12, 2e-12, 0, 0, 0, 1, 1, -1},
+        // b is zero: -0.0 counts as zero; a NaN is not zero and orders nothing.
+        {-1.0, -0.0, 0, 0, 0, 1, 1, -1},
+        {kNaN, 1.0, 0, 0, 0, 0, 0, -1},
+    };
+    for (Case const& c : cases) {
+        SCOPED_TRACE(testing::Message() << "a=" << c.a << " b=" << c.b);
+        EXPECT_EQ(FP_EQ(c.a, c.b), c.eq);
+        EXPECT_EQ(FP_GT(c.a, c.b), c.gt);
+        EXPECT_EQ(FP_GE(c.a, c.b), c.ge);
+        EXPECT_EQ(FP_LT(c.a, c.b), c.lt);
+        EXPECT_EQ(FP_LE(c.a, c.b), c.le);
+        EXPECT_EQ(FP_Compare(c.a, c.b), c.compare);
+    }
+}
+
+TEST(CompareCallbacks, OrderValuesAndTreatNaNAsEqual) {
+    static_assert(std::is_convertible_v<decltype(&DoubleCompare), CompareFunction>);
+    double const d[] = {1.0, 2.0, kNaN};
+    EXPECT_EQ(DoubleCompare(&d[0], &d[1]), -1);
+    EXPECT_EQ(DoubleCompare(&d[1], &d[0]), 1);
+    EXPECT_EQ(DoubleCompare(&d[0], &d[0]), 0);
+    EXPECT_EQ(DoubleCompare(&d[2], &d[0]), 0);
+    EXPECT_EQ(DoubleCompare(&d[0], &d[2]), 0);
+    float const f[] = {-1.5f, 3.0f, std::numeric_limits<float>::quiet_NaN()};
+    EXPECT_EQ(FloatCompare(&f[0], &f[1]), -1);
+    EXPECT_EQ(FloatCompare(&f[2], &f[1]), 0);
+    std::int32_t const i[] = {INT32_MIN, INT32_MAX};
+    EXPECT_EQ(IntCompare(&i[0], &i[1]), -1); // no overflow from subtracting
+    EXPECT_EQ(IntCompare(&i[1], &i[0]), 1);
+    std::int16_t const s[] = {-32768, 32767};
+    EXPECT_EQ(ShortCompare(&s[0], &s[1]), -1);
+    EXPECT_EQ(ShortCompare(&s[1], &s[1]), 0);
+}
+
+TEST(CompareCallbacks, CStringsCompareAsUnsignedBytes) {
+    char const* const texts[] = {"abc", "abd", "ab", "\xE9", nullptr};
+    EXPECT_EQ(CStringCompare(&texts[0], &texts[1]), -1);
+    EXPECT_EQ(CStringCompare(&texts[2], &texts[0]), -1);
+    EXPECT_EQ(CStringCompare(&texts[3], &texts[0]), 1); // 0xE9 is above 'a', not negative
+    EXPECT_EQ(CStringCompare(&texts[0], &texts[0]), 0);
+    EXPECT_EQ(CStringCompare(&texts[4], &texts[0]), -1);
+    EXPECT_EQ(CStringCompare(&texts[4], &texts[4]), 0);
+}
+
+TEST(CompareWithPrecision, EqualToTheGivenSignificantDigits) {
+    struct {
+        double a, b;
+        int digits, expected;
+    } const cases[] = {
+        {1.0001, 1.0002, 3, 0},     {1.0001, 1.0002, 5, -1},     {1.0002, 1.0001, 5, 1},
+        {123456.0, 123457.0, 5, 0}, {123456.0, 123457.0, 6, -1}, {-2.0, 2.0, 1, -1},
+        {0.0, 1e-300, 3, -1},       {1.0, 1.0 + 1e-16, 17, 0},   {1.0, 1.0 + 2.3e-16, 18, -1},
+        {kNaN, 1.0, 3, 0},          {1e308, INFINITY, 3, -1},    {INFINITY, INFINITY, 3, 0},
+        {1.0, 1.05, 0, 0}, // fewer than 1 digit counts as 1
+    };
+    for (auto const& c : cases) {
+        SCOPED_TRACE(testing::Message() << c.a << " " << c.b << " " << c.digits);
+        EXPECT_EQ(TEKIT_CompareWithPrecision(c.a, c.b, c.digits), c.expected);
+    }
+}
+
+} // namespace

@@ -1,0 +1,173 @@
+#include "tekit/toolbox/DataText.h"
+#include "tekit/toolbox/MemoryHelpers.h"
+
+#include "tekit/errors/TEError.h"
+
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <cstring>
+#include <random>
+#include <string>
+#include <vector>
+
+namespace {
+
+using namespace tekit;
+
+std::string Encode(std::string const& bytes) {
+    std::string text(
+        static_cast<std::size_t>(GetTextSizeForData(static_cast<int>(bytes.size()))) + 1, '#');
+    int const n = ConvertDataToTextInBuffer(bytes.data(), static_cast<int>(bytes.size()),
+                                            text.data(), static_cast<int>(text.size()));
+    EXPECT_EQ(n, static_cast<int>(text.size()) - 1);
+    text.resize(static_cast<std::size_t>(std::max(n, 0)));
+    return text;
+}
+
+// Fixed texts: a change of alphabet, bit order or tail form would silently break every stored
+// INI data value and compressed string, so the exact characters are pinned.
+TEST(DataText, EncodesKnownBytesAsPinnedText) {
+    struct {
+        std::string bytes, text;
+    } const cases[] = {
+        {"", ""},
+        {std::string(4, '\0'), "......"},
+        {"\xFF\xFF\xFF\xFF", "zzzzzk"},
+        {"PMCZ", "J3p2LV"}, // a compressed block's magic
+        {"\xFF", "zk"},
+        {"\x01\x02", ".F7"},
+        {"abc", "NL8Y"},
+        {"Hello, world!", "H5KgQ.QmkVSkQr8gO.7F"},
+    };
+    for (auto const& c : cases) {
+        EXPECT_EQ(Encode(c.bytes), c.text);
+        char* const text = ConvertDataToText(c.bytes.data(), static_cast<int>(c.bytes.size()));
+        ASSERT_NE(text, nullptr);
+        EXPECT_STREQ(text, c.text.c_str());
+        TBFree(text);
+    }
+}
+
+TEST(DataText, SizesKeepTheFourToSixRatio) {
+    int const textSizes[] = {0, 2, 3, 4, 6, 8, 9, 10, 12};
+    for (int n = 0; n < 9; ++n) {
+        EXPECT_EQ(GetTextSizeForData(n), textSizes[n]);
+        EXPECT_EQ(GetDataSizeForText(textSizes[n]), n);
+    }
+    EXPECT_EQ(GetTextSizeForData(4000), 6000);
+    EXPECT_EQ(GetTextSizeForData(1431655764), 2147483646); // the largest text with terminator
+    EXPECT_EQ(GetTextSizeForData(1431655765), TE_INVALID_OR_OUT_OF_RANGE);
+    EXPECT_EQ(GetTextSizeForData(-1), TE_INVALID_OR_OUT_OF_RANGE);
+    EXPECT_EQ(GetDataSizeForText(1), TE_UNRECOGNIZED_VALUE);
+    EXPECT_EQ(GetDataSizeForText(11), TE_UNRECOGNIZED_VALUE);
+    EXPECT_EQ(GetDataSizeForText(-6), TE_INVALID_OR_OUT_OF_RANGE);
+    EXPECT_EQ(GetDataSizeForText(2147483646), 1431655764);
+}
+
+TEST(DataText, RoundTripsEveryLengthAndKeepsPrefixesAndOrder) {
+    std::mt19937 random(7);
+    std::string previousBytes;
+    for (int length = 0; length <= 67; ++length) {
+        std::string bytes(static_cast<std::size_t>(length), '\0');
+        for (char& b : bytes)
+            b = static_cast<char>(random());
+        std::string const text = Encode(bytes);
+        std::string back(bytes.size(), '\0');
+        EXPECT_EQ(ConvertTextToDataInBuffer(text.c_str(), -1, back.data(), length), length);
+        EXPECT_EQ(back, bytes);
+        // Every 4 bytes decide their own 6 characters: the first group of a longer block
+        // reads the same as the 4 bytes alone.
+        if (length >= 4) {
+            EXPECT_EQ(text.substr(0, 6), Encode(bytes.substr(0, 4)));
+        }
+        // Texts of one length sort as their bytes.
+        std::string const other = previousBytes + "x";
+        EXPECT_EQ(Encode(other) < text, other < bytes) << length;
+        previousBytes = bytes;
+    }
+}
+
+TEST(DataText, TextIsSafeInIniXmlAndCsv) {
+    std::string all;
+    for (int b = 0; b < 256; ++b)
+        all += static_cast<char>(b);
+    for (int shift = 0; shift < 4; ++shift) {
+        std::string const text = Encode(all.substr(static_cast<std::size_t>(shift)));
+        EXPECT_EQ(text.find_first_of(" \t\r\n\"',&<>;=[]\\"), std::string::npos);
+        for (char c : text)
+            EXPECT_TRUE(c > ' ' && c < 127) << int(c);
+    }
+}
+
+// Malformed text fails with the one status and leaves the destination as it was.
+TEST(DataText, RejectsMalformedTextWithoutWriting) {
+    struct {
+        std::string text;
+        char const* why;
+    } const cases[] = {
+        {"J3p2L", "a 6k + 5 length"},
+        {"J", "a 6k + 1 length"},
+        {"J3p2L=", "a character outside the alphabet"},
+        {"J3p 2LV", "white space"},
+        {std::string("J3p\0LV", 6), "a NUL inside the given length"},
+        {"zzzzzz", "unused bits of a full group set"},
+        {"HH5KgQ......", "unused bits of a group before the last set"},
+        {"zz", "unused bits of a 1-byte tail set"},
+        {".F8", "unused bits of a 2-byte tail set"},
+        {"\xC3\xA9\xC3\xA9..", "bytes above 127"},
+    };
+    for (auto const& c : cases) {
+        SCOPED_TRACE(c.why);
+        unsigned char buffer[16];
+        std::memset(buffer, 0xAB, sizeof buffer);
+        EXPECT_EQ(ConvertTextToDataInBuffer(c.text.data(), static_cast<int>(c.text.size()), buffer,
+                                            sizeof buffer),
+                  TE_UNRECOGNIZED_VALUE);
+        EXPECT_TRUE(std::all_of(buffer, buffer + sizeof buffer, [](int b) { return b == 0xAB; }));
+        int size = -7;
+        EXPECT_EQ(ConvertTextToData(c.text.data(), static_cast<int>(c.text.size()), &size),
+                  nullptr);
+        EXPECT_EQ(size, -7);
+    }
+}
+
+TEST(DataText, RejectsBadArgumentsWithoutWriting) {
+    char text[16] = "unchanged";
+    unsigned char data[16] = {1, 2, 3, 4, 5, 6, 7, 8};
+    // Too small by the terminator, null pointers, negative sizes, a negative length below -1.
+    EXPECT_EQ(ConvertDataToTextInBuffer(data, 4, text, 6), TE_INVALID_OR_OUT_OF_RANGE);
+    EXPECT_EQ(ConvertDataToTextInBuffer(nullptr, 4, text, 16), TE_INVALID_POINTER);
+    EXPECT_EQ(ConvertDataToTextInBuffer(data, 4, nullptr, 16), TE_INVALID_POINTER);
+    EXPECT_EQ(ConvertDataToTextInBuffer(data, -4, text, 16), TE_INVALID_OR_OUT_OF_RANGE);
+    EXPECT_STREQ(text, "unchanged");
+    EXPECT_EQ(ConvertTextToDataInBuffer("J3p2LV", -1, data, 3), TE_INVALID_OR_OUT_OF_RANGE);
+    EXPECT_EQ(ConvertTextToDataInBuffer("J3p2LV", -2, data, 16), TE_INVALID_OR_OUT_OF_RANGE);
+    EXPECT_EQ(ConvertTextToDataInBuffer(nullptr, 6, data, 16), TE_INVALID_POINTER);
+    EXPECT_EQ(ConvertTextToDataInBuffer("J3p2LV", -1, nullptr, 16), TE_INVALID_POINTER);
+    EXPECT_EQ(data[0], 1);
+    EXPECT_EQ(ConvertDataToText(nullptr, 1), nullptr);
+    EXPECT_EQ(ConvertDataToText(data, -1), nullptr);
+    EXPECT_EQ(ConvertTextToData(nullptr, -1, nullptr), nullptr);
+    // Nothing to convert needs no pointers; an empty block is still a block.
+    EXPECT_EQ(ConvertDataToTextInBuffer(nullptr, 0, text, 1), 0);
+    EXPECT_STREQ(text, "");
+    EXPECT_EQ(ConvertTextToDataInBuffer(nullptr, 0, nullptr, 0), 0);
+    int size = -1;
+    void* const empty = ConvertTextToData("", -1, &size);
+    EXPECT_NE(empty, nullptr);
+    EXPECT_EQ(size, 0);
+    TBFree(empty);
+}
+
+TEST(DataText, RejectsOverlappingSourceAndDestination) {
+    char buffer[32] = "J3p2LVJ3p2LV";
+    EXPECT_EQ(ConvertTextToDataInBuffer(buffer, 12, buffer + 4, 8), TE_INCOMPATIBLE_PARAMETERS);
+    EXPECT_EQ(ConvertDataToTextInBuffer(buffer + 8, 8, buffer, 32), TE_INCOMPATIBLE_PARAMETERS);
+    EXPECT_STREQ(buffer, "J3p2LVJ3p2LV");
+    // Adjacent, not overlapping: decoding into the bytes just after the text is allowed.
+    EXPECT_EQ(ConvertTextToDataInBuffer(buffer, 6, buffer + 6, 4), 4);
+    EXPECT_EQ(std::memcmp(buffer + 6, "PMCZ", 4), 0);
+}
+
+} // namespace

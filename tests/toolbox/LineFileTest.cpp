@@ -1,0 +1,202 @@
+#include "tekit/toolbox/LineFile.h"
+
+#include "tekit/errors/TEError.h"
+
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <climits>
+#include <cstdio>
+#include <ostream>
+#include <stdexcept>
+#include <string>
+#include <vector>
+
+namespace {
+
+using namespace tekit;
+
+/// A byte source in memory that hands out at most `maxRead` bytes per call, so lines and
+/// pairs of line ends straddle chunk boundaries; it can fail on a given call.
+constexpr int kRealCount = INT_MIN;
+
+struct MemorySource {
+    std::string bytes;
+    int maxRead = 2048;
+    int failOnCall = -1;       ///< the call (from 0) that returns an error
+    int badCount = kRealCount; ///< a count to report instead of the real one
+    bool throwInstead = false;
+    std::size_t position = 0;
+    int calls = 0;
+
+    static int TEKIT_STDCALL Read(void* source, int numBytes, int* numRead, void* buffer) {
+        auto& s = *static_cast<MemorySource*>(source);
+        if (s.calls++ == s.failOnCall) {
+            if (s.throwInstead)
+                throw std::runtime_error("callback failed");
+            return -42;
+        }
+        std::size_t const n =
+            std::min({static_cast<std::size_t>(numBytes), static_cast<std::size_t>(s.maxRead),
+                      s.bytes.size() - s.position});
+        std::copy_n(s.bytes.data() + s.position, n, static_cast<char*>(buffer));
+        s.position += n;
+        *numRead = s.badCount != kRealCount ? s.badCount : static_cast<int>(n);
+        return 0;
+    }
+};
+
+struct Line {
+    std::string text;
+    long long offset;
+    int extra;
+    bool operator==(Line const&) const = default;
+};
+
+std::ostream& operator<<(std::ostream& out, Line const& line) {
+    return out << '"' << line.text << "\"@" << line.offset << "+" << line.extra;
+}
+
+/// Every line up to the end of input, with the reader's position figures for each.
+std::vector<Line> ReadAll(std::string const& bytes, int maxLen, int maxRead, bool nonEmpty = false,
+                          int* numLines = nullptr) {
+    MemorySource source{bytes, maxRead};
+    LineFile reader = LineFile_New(MemorySource::Read, &source);
+    std::vector<Line> lines;
+    std::vector<char> buffer(static_cast<std::size_t>(maxLen) + 1);
+    for (;;) {
+        int length = -1, end = -1;
+        int const status = nonEmpty
+                               ? LineFile_ReadNonEmpty(reader, buffer.data(), maxLen, &length, &end)
+                               : LineFile_Read(reader, buffer.data(), maxLen, &length, &end);
+        EXPECT_EQ(status, 0);
+        if (status != 0 || end)
+            break;
+        EXPECT_EQ(std::string(buffer.data()).size(), static_cast<std::size_t>(length));
+        lines.push_back({buffer.data(), LineFile_OffsetOfLastLine(reader),
+                         LineFile_NumExtraLineTermChars(reader)});
+    }
+    if (numLines)
+        *numLines = LineFile_NumLinesRead(reader);
+    LineFile_Dispose(reader);
+    return lines;
+}
+
+// Each source is read with chunks of every size from 1 byte: a pair of line ends split across
+// two chunks, and a cut line whose rest lies in later chunks, must read the same.
+TEST(LineFile, SplitsAtEveryKindOfLineEnd) {
+    struct {
+        std::string bytes;
+        int maxLen;
+        std::vector<Line> lines;
+    } const cases[] = {
+        {"x\r\ny\r\n", 80, {{"x", 0, 0}, {"y", 3, 1}}},
+        {"a\nb", 80, {{"a", 0, 0}, {"b", 2, 0}}},                     // no final line end
+        {"", 80, {}},                                                 // nothing at all
+        {"\nx", 80, {{"x", 1, 1}}},                                   // no leading empty line
+        {"x\r\r", 80, {{"x", 0, 0}, {"", 2, 0}}},                     // CR CR: two line ends
+        {"x\n\ny", 80, {{"x", 0, 0}, {"", 2, 0}, {"y", 3, 0}}},       // LF LF likewise
+        {"a\n\rb\r\nc", 80, {{"a", 0, 0}, {"b", 3, 1}, {"c", 6, 1}}}, // LF CR and CR LF
+        {std::string("a\0b\0\0c", 6), 80, {{"a", 0, 0}, {"b", 2, 0}, {"", 4, 0}, {"c", 5, 0}}},
+        {std::string("a\n\0b", 4), 80, {{"a", 0, 0}, {"b", 3, 1}}}, // LF NUL pairs too
+        {"\r\r", 80, {{"", 1, 1}}},
+        {"abcdef\nxy\n", 3, {{"abc", 0, 0}, {"xy", 7, 0}}},    // cut, then in sync
+        {"abc\n\nd", 0, {{"", 0, 0}, {"", 4, 0}, {"", 5, 0}}}, // nothing kept, lines still
+    };
+    for (auto const& c : cases) {
+        for (int maxRead : {1, 2, 3, 5, 2048}) {
+            SCOPED_TRACE(testing::Message()
+                         << testing::PrintToString(c.bytes) << " in chunks of " << maxRead);
+            int numLines = -1;
+            EXPECT_EQ(ReadAll(c.bytes, c.maxLen, maxRead, false, &numLines), c.lines);
+            EXPECT_EQ(numLines, static_cast<int>(c.lines.size()));
+        }
+    }
+}
+
+TEST(LineFile, LongLinesAcrossManyChunks) {
+    std::string const longLine(5000, 'q');
+    auto const lines = ReadAll(longLine + "\r\n" + "tail", 640, 2048);
+    ASSERT_EQ(lines.size(), 2u);
+    EXPECT_EQ(lines[0].text, longLine.substr(0, 640));
+    EXPECT_EQ(lines[1], (Line{"tail", 5002, 1}));
+}
+
+TEST(LineFile, EndOfInputIsReportedOnceThereIsNothingLeft) {
+    MemorySource source{"x\r\n"};
+    LineFile reader = LineFile_New(MemorySource::Read, &source);
+    char buffer[8];
+    int length = -1, end = -1;
+    EXPECT_EQ(LineFile_OffsetOfLastLine(reader), -1);
+    ASSERT_EQ(LineFile_Read(reader, buffer, 7, &length, &end), 0);
+    EXPECT_EQ(end, 0);
+    for (int i = 0; i < 2; ++i) { // and again: the end stays the end
+        ASSERT_EQ(LineFile_Read(reader, buffer, 7, &length, &end), 0);
+        EXPECT_EQ(end, 1);
+        EXPECT_EQ(length, 0);
+        EXPECT_STREQ(buffer, "");
+    }
+    EXPECT_EQ(LineFile_NumLinesRead(reader), 1);
+    EXPECT_EQ(LineFile_OffsetOfLastLine(reader), 3); // the size of the source
+    LineFile_Dispose(reader);
+}
+
+// Empty means no byte other than blanks, counting the bytes cut off a long line.
+TEST(LineFile, ReadNonEmptySkipsBlankLinesButCountsThem) {
+    int numLines = 0;
+    auto const lines = ReadAll("  \n\tx\n \f\v\n\n y\n   z\n", 2, 3, true, &numLines);
+    std::vector<Line> const expected = {{"\tx", 3, 0}, {" y", 11, 0}, {"  ", 14, 0}};
+    EXPECT_EQ(lines, expected);
+    EXPECT_EQ(numLines, 6);
+}
+
+TEST(LineFile, ChunkErrorsAndBadCallbacksAreReturned) {
+    char buffer[16];
+    int length = 0, end = 0;
+    struct {
+        MemorySource source;
+        int expected;
+    } cases[] = {
+        {{"line one\nline two\n", 4, 1}, -42},                     // error of the callback
+        {{"abc", 2048, -1, 4096}, TE_INVALID_OR_OUT_OF_RANGE},     // more than was asked for
+        {{"abc", 2048, -1, -3}, TE_INVALID_OR_OUT_OF_RANGE},       // a negative count
+        {{"abc", 2048, 0, kRealCount, true}, TE_OPERATION_FAILED}, // an exception
+    };
+    for (auto& c : cases) {
+        LineFile reader = LineFile_New(MemorySource::Read, &c.source);
+        EXPECT_EQ(LineFile_Read(reader, buffer, 15, &length, &end), c.expected);
+        LineFile_Dispose(reader);
+    }
+    LineFile reader = LineFile_New(MemorySource::Read, &cases[0].source);
+    EXPECT_EQ(LineFile_Read(nullptr, buffer, 15, &length, &end), TE_INVALID_POINTER);
+    EXPECT_EQ(LineFile_Read(reader, nullptr, 15, &length, &end), TE_INVALID_POINTER);
+    EXPECT_EQ(LineFile_Read(reader, buffer, -1, &length, &end), TE_INVALID_OR_OUT_OF_RANGE);
+    EXPECT_EQ(LineFile_Read(reader, buffer, 15, nullptr, nullptr), 0); // outputs are optional
+    LineFile_Dispose(reader);
+    LineFile_Dispose(nullptr);
+    EXPECT_EQ(LineFile_NumLinesRead(nullptr), 0);
+    EXPECT_EQ(LineFile_OffsetOfLastLine(nullptr), -1);
+}
+
+TEST(LineFile, ReadsAFileByDefault) {
+    std::FILE* file = std::tmpfile();
+    ASSERT_NE(file, nullptr);
+    std::string const text = std::string(3000, 'a') + "\r\nb";
+    std::fwrite(text.data(), 1, text.size(), file);
+    std::rewind(file);
+    LineFile reader = LineFile_New(nullptr, file);
+    std::vector<char> buffer(4001);
+    int length = 0, end = 0;
+    ASSERT_EQ(LineFile_Read(reader, buffer.data(), 4000, &length, &end), 0);
+    EXPECT_EQ(length, 3000);
+    ASSERT_EQ(LineFile_Read(reader, buffer.data(), 4000, &length, &end), 0);
+    EXPECT_STREQ(buffer.data(), "b");
+    ASSERT_EQ(LineFile_Read(reader, buffer.data(), 4000, &length, &end), 0);
+    EXPECT_EQ(end, 1);
+    LineFile_Dispose(reader);
+    std::fclose(file);
+    int count = 0;
+    EXPECT_EQ(LineFile_ReadFromFile(nullptr, 10, &count, buffer.data()), TE_INVALID_POINTER);
+}
+
+} // namespace

@@ -1,0 +1,176 @@
+#include "tekit/toolbox/TextHelpers.h"
+#include "tekit/toolbox/MemoryHelpers.h"
+
+#include "support/MultiByteFixture.h"
+#include "tekit/errors/TEError.h"
+
+#include <gtest/gtest.h>
+
+#include <climits>
+#include <cstring>
+#include <string>
+#include <vector>
+
+namespace {
+
+using namespace tekit;
+using TextHelpers = tekit::testing::MultiByteFixture;
+
+TEST_F(TextHelpers, WhiteSpaceScans) {
+    char const text[] = " \t\r\n\v\fab c";
+    EXPECT_EQ(SkipWhiteSpace(text), text + 6);
+    EXPECT_EQ(SkipNonWhiteSpace(text + 6), text + 8);
+    EXPECT_EQ(*SkipNonWhiteSpace("abc"), '\0');
+    EXPECT_EQ(HasNonWhiteSpace(" \t x"), 1);
+    EXPECT_EQ(HasNonWhiteSpace(" \t\r\n"), 0);
+    EXPECT_EQ(HasNonWhiteSpace(nullptr), 0);
+    EXPECT_EQ(SkipWhiteSpace(nullptr), nullptr);
+    EXPECT_EQ(SkipNonWhiteSpace(nullptr), nullptr);
+}
+
+TEST_F(TextHelpers, CompareIgnoringCase) {
+    struct {
+        char const *a, *b;
+        int expected;
+    } const cases[] = {
+        {"Voltage", "vOLTAGE", 0},
+        {"abc", "abd", -1},
+        {"abc", "ab", 1},
+        {"_", "a", -1}, // case folds to lower: '_' (0x5F) sorts before 'a'
+        {"", "", 0},
+        {nullptr, "", -1},
+        {nullptr, nullptr, 0},
+        {"\xE9", "a", 1},
+    };
+    for (auto const& c : cases) {
+        EXPECT_EQ(StrICmp(c.a, c.b), c.expected) << (c.a ? c.a : "null");
+        EXPECT_EQ(StrICmp(c.b, c.a), -c.expected);
+    }
+    EXPECT_EQ(StrICmpWithoutSurrWhiteSpace("  Gain \t", "GAIN"), 0);
+    EXPECT_EQ(StrICmpWithoutSurrWhiteSpace(" a b ", "a  b"), 1); // inner space counts
+    EXPECT_EQ(StrICmpWithoutSurrWhiteSpace("   ", ""), 0);
+}
+
+// In Shift-JIS "\x82\x61" and "\x82\x41" are two different double-byte characters whose trail
+// bytes happen to be 'a' and 'A'; only the single-byte view may fold them together.
+TEST_F(TextHelpers, MultiByteModeNeverFoldsTrailBytes) {
+    EXPECT_EQ(StrICmp("\x82\x61", "\x82\x41"), 0);
+    UseShiftJis();
+    EXPECT_EQ(StrICmp("\x82\x61", "\x82\x41"), 1);
+    EXPECT_EQ(StrICmp("A\x82\x61", "a\x82\x61"), 0);
+    EXPECT_EQ(StrICmpWithoutSurrWhiteSpace(" \x82\x61 ", "\x82\x61"), 0);
+}
+
+TEST_F(TextHelpers, CopyMaxCutsWithoutSplittingACharacter) {
+    char buffer[4];
+    EXPECT_EQ(StringCopyMax(buffer, "abcdef", sizeof buffer), 3);
+    EXPECT_STREQ(buffer, "abc");
+    EXPECT_EQ(StringCopyMax(buffer, nullptr, sizeof buffer), 0);
+    EXPECT_STREQ(buffer, "");
+    UseShiftJis();
+    EXPECT_EQ(StringCopyMax(buffer, "ab\x82\xA0", sizeof buffer), 2); // not half a character
+    EXPECT_STREQ(buffer, "ab");
+    EXPECT_EQ(StringCopyMax(buffer, "a\x82\xA0z", sizeof buffer), 3);
+    EXPECT_STREQ(buffer, "a\x82\xA0");
+}
+
+TEST_F(TextHelpers, InsertCountsCharactersAndCutsTheEnd) {
+    char buffer[12] = "ad";
+    EXPECT_EQ(StringInsert(buffer, "bc", 1, sizeof buffer), 4);
+    EXPECT_STREQ(buffer, "abcd");
+    EXPECT_EQ(StringInsert(buffer, "XYZ", 4, sizeof buffer), 7);
+    EXPECT_STREQ(buffer, "abcdXYZ");
+    EXPECT_EQ(StringInsert(buffer, "0123456789", 0, sizeof buffer), 11);
+    EXPECT_STREQ(buffer, "0123456789a");
+    UseShiftJis();
+    char mb[8] = "\x82\xA0z";
+    EXPECT_EQ(StringInsert(mb, "y", 1, sizeof mb), 4); // after the first character, not byte
+    EXPECT_STREQ(mb, "\x82\xA0yz");
+    EXPECT_EQ(StringInsert(mb, "1234", 0, 6), 4); // room for 5 bytes: no half character
+    EXPECT_STREQ(mb, "1234");
+}
+
+TEST_F(TextHelpers, BadArgumentsChangeNothing) {
+    char buffer[8] = "abc";
+    EXPECT_EQ(StringCopyMax(nullptr, "x", 4), TE_INVALID_POINTER);
+    EXPECT_EQ(StringCopyMax(buffer, "x", 0), TE_INVALID_OR_OUT_OF_RANGE);
+    EXPECT_EQ(StringCopyMax(buffer + 1, buffer, 4), TE_INCOMPATIBLE_PARAMETERS);
+    EXPECT_EQ(StringInsert(buffer, "x", 4, sizeof buffer), TE_INVALID_OR_OUT_OF_RANGE);
+    EXPECT_EQ(StringInsert(buffer, "x", -1, sizeof buffer), TE_INVALID_OR_OUT_OF_RANGE);
+    EXPECT_EQ(StringInsert(buffer, buffer + 1, 0, sizeof buffer), TE_INCOMPATIBLE_PARAMETERS);
+    EXPECT_EQ(StringInsert(buffer, "x", 0, 3), TE_INVALID_OR_OUT_OF_RANGE); // no terminator
+    EXPECT_EQ(StringInsert(nullptr, "x", 0, 3), TE_INVALID_POINTER);
+    EXPECT_STREQ(buffer, "abc");
+    EXPECT_EQ(RemoveSurroundingWhiteSpace(nullptr), TE_INVALID_POINTER);
+    EXPECT_EQ(StrDupWithoutSurrWhiteSpace(nullptr), nullptr);
+    EXPECT_EQ(TBStrDup(nullptr), nullptr);
+}
+
+TEST_F(TextHelpers, TrimAndDuplicate) {
+    char text[] = " \t Limit 1 \r\n";
+    EXPECT_EQ(RemoveSurroundingWhiteSpace(text), 7);
+    EXPECT_STREQ(text, "Limit 1");
+    char* const trimmed = StrDupWithoutSurrWhiteSpace("  x y  ");
+    EXPECT_STREQ(trimmed, "x y");
+    TBFree(trimmed);
+    char* const copy = TBStrDup("");
+    EXPECT_STREQ(copy, "");
+    TBFree(copy);
+}
+
+TEST_F(TextHelpers, SpliceSplitsAtCommasInPlace) {
+    char text[] = " a , b c,, d ";
+    EXPECT_EQ(SpliceCommaSeparatedList(text, nullptr, 0), 4); // counting changes nothing
+    EXPECT_STREQ(text, " a , b c,, d ");
+    char* items[4];
+    EXPECT_EQ(SpliceCommaSeparatedList(text, items, 3), TE_INVALID_OR_OUT_OF_RANGE);
+    EXPECT_STREQ(text, " a , b c,, d ");
+    ASSERT_EQ(SpliceCommaSeparatedList(text, items, 4), 4);
+    EXPECT_STREQ(items[0], "a");
+    EXPECT_STREQ(items[1], "b c");
+    EXPECT_STREQ(items[2], "");
+    EXPECT_STREQ(items[3], "d");
+    char blank[] = "  ";
+    EXPECT_EQ(SpliceCommaSeparatedList(blank, items, 4), 0);
+    EXPECT_EQ(SpliceCommaSeparatedList(nullptr, items, 4), TE_INVALID_POINTER);
+}
+
+TEST_F(TextHelpers, StringsToIntegers) {
+    struct {
+        char const* text;
+        int ok;
+        int value;
+    } const ints[] = {
+        {"0", 1, 0},
+        {" -12 ", 1, -12},
+        {"+7", 1, 7},
+        {"2147483647", 1, INT_MAX},
+        {"-2147483648", 1, INT_MIN},
+        {"2147483648", 0, 0},
+        {"-2147483649", 0, 0},
+        {"99999999999999999999", 0, 0},
+        {"", 0, 0},
+        {" ", 0, 0},
+        {"-", 0, 0},
+        {"1 2", 0, 0},
+        {"12x", 0, 0},
+        {"0x10", 0, 0},
+        {"- 1", 0, 0},
+    };
+    for (auto const& c : ints) {
+        int value = 12345;
+        EXPECT_EQ(TBStrToInt(c.text, &value), c.ok) << c.text;
+        EXPECT_EQ(value, c.ok ? c.value : 12345) << c.text;
+    }
+    unsigned value = 5;
+    EXPECT_EQ(StrToUInt(" 4294967295 ", &value), 1);
+    EXPECT_EQ(value, 4294967295u);
+    EXPECT_EQ(StrToUInt("4294967296", &value), 0);
+    EXPECT_EQ(StrToUInt("-1", &value), 0);
+    EXPECT_EQ(StrToUInt("+1", &value), 0);
+    EXPECT_EQ(value, 4294967295u);
+    EXPECT_EQ(TBStrToInt(nullptr, nullptr), 0);
+    EXPECT_EQ(StrToUInt("1", nullptr), 0);
+}
+
+} // namespace

@@ -1,0 +1,182 @@
+#include "tekit/toolbox/DateTime.h"
+#include "tekit/toolbox/IntegerList.h"
+#include "tekit/toolbox/MemoryHelpers.h"
+#include "tekit/toolbox/Random.h"
+#include "tekit/toolbox/Sound.h"
+#include "tekit/toolbox/Timer.h"
+
+#include "tekit/errors/TEError.h"
+#include "toolbox/DateTimeText.h"
+
+#include <gtest/gtest.h>
+
+#include <climits>
+#include <cstring>
+#include <limits>
+#include <string>
+#include <vector>
+
+namespace {
+
+using namespace tekit;
+
+std::vector<int> Values(int const* list, int n) {
+    return n > 0 ? std::vector<int>(list, list + n) : std::vector<int>{};
+}
+
+TEST(IntegerList, BuildsFromValuesAndRanges) {
+    struct {
+        char const* text;
+        std::vector<int> values;
+    } const cases[] = {
+        {"1, 3, 5-8", {1, 3, 5, 6, 7, 8}},
+        {"8-5", {8, 7, 6, 5}},
+        {"-3--1, +4", {-3, -2, -1, 4}},
+        {" 7 - 7 ", {7}},
+        {"  ", {}},
+        {"2147483646-2147483647", {INT_MAX - 1, INT_MAX}},
+    };
+    for (auto const& c : cases) {
+        int* list = nullptr;
+        int const n = BuildIntegerList(c.text, &list);
+        EXPECT_EQ(Values(list, n), c.values) << c.text;
+        TBFree(list);
+    }
+}
+
+TEST(IntegerList, RejectsBadTextAndLeavesTheListAlone) {
+    int marker = 0;
+    int* list = &marker;
+    char const* const bad[] = {"1,,2", "1,", "x", "1-2-3", "1 2", "2147483648", "-"};
+    for (char const* text : bad)
+        EXPECT_EQ(BuildIntegerList(text, &list), TE_UNRECOGNIZED_VALUE) << text;
+    EXPECT_EQ(BuildIntegerList("0-16777216", &list), TE_INVALID_OR_OUT_OF_RANGE); // too many
+    EXPECT_EQ(BuildIntegerList(nullptr, &list), TE_INVALID_POINTER);
+    EXPECT_EQ(list, &marker);
+}
+
+TEST(IntegerList, AppendsOneValueAtATime) {
+    int* list = nullptr;
+    int n = 0;
+    for (int i = 0; i < 1000; ++i)
+        ASSERT_EQ(AppendToIntegerList(&list, &n, i * 3), 1);
+    ASSERT_EQ(n, 1000);
+    EXPECT_EQ(list[999], 2997);
+    // A built list grows the same way.
+    int* built = nullptr;
+    int m = BuildIntegerList("1-5", &built);
+    EXPECT_EQ(AppendToIntegerList(&built, &m, 6), 1);
+    EXPECT_EQ(Values(built, m), (std::vector<int>{1, 2, 3, 4, 5, 6}));
+    int bad = -1;
+    EXPECT_EQ(AppendToIntegerList(&list, &bad, 1), 0);
+    EXPECT_EQ(AppendToIntegerList(nullptr, &n, 1), 0);
+    TBFree(list);
+    TBFree(built);
+}
+
+TEST(IntegerList, FindsANamedParameter) {
+    char const* const info = "channels = 1-3, 8 ; Gain=2;;";
+    int* list = nullptr;
+    EXPECT_EQ(GetIntListFromParmInfo(info, "CHANNELS", &list), 4);
+    EXPECT_EQ(Values(list, 4), (std::vector<int>{1, 2, 3, 8}));
+    TBFree(list);
+    list = nullptr;
+    EXPECT_EQ(GetIntListFromParmInfo(info, " gain ", &list), 1);
+    EXPECT_EQ(list[0], 2);
+    TBFree(list);
+    EXPECT_EQ(GetIntListFromParmInfo(info, "offset", &list), TE_READ_OBJECT_NOT_FOUND);
+    EXPECT_EQ(GetIntListFromParmInfo("gain", "gain", &list), TE_UNRECOGNIZED_VALUE);
+    EXPECT_EQ(GetIntListFromParmInfo(info, nullptr, &list), TE_INVALID_POINTER);
+}
+
+TEST(MemoryHelpers, SwapBlockRefusesPartialOverlap) {
+    char a[600], b[600];
+    std::memset(a, 'a', sizeof a);
+    std::memset(b, 'b', sizeof b);
+    EXPECT_EQ(SwapBlock(a, b, sizeof a), 1); // more than one step of the swap
+    EXPECT_EQ(a[599], 'b');
+    EXPECT_EQ(b[0], 'a');
+    EXPECT_EQ(SwapBlock(a, a, 10), 1);
+    EXPECT_EQ(SwapBlock(a, a + 5, 10), 0);
+    EXPECT_EQ(SwapBlock(a, nullptr, 10), 0);
+    EXPECT_EQ(SwapBlock(a, b, 0), 0);
+    EXPECT_EQ(a[5], 'b');
+}
+
+TEST(MemoryHelpers, RoundToNextMultiple) {
+    struct {
+        int value, multiple, expected;
+    } const cases[] = {
+        {13, 8, 16},
+        {16, 8, 16},
+        {0, 8, 0},
+        {-13, 8, -8},
+        {-16, 8, -16},
+        {13, 0, 13},
+        {13, -4, 13},
+        {INT_MAX, 2, INT_MAX},
+        {INT_MIN, 3, INT_MIN + 2},
+        {INT_MAX - 1, INT_MAX, INT_MAX},
+    };
+    for (auto const& c : cases)
+        EXPECT_EQ(RoundToNextMultiple(c.value, c.multiple), c.expected)
+            << c.value << " " << c.multiple;
+}
+
+TEST(Random, RepeatsForASeedAndStaysInRange) {
+    SetRandomSeed(42);
+    std::vector<double> first;
+    for (int i = 0; i < 100; ++i)
+        first.push_back(Random(-1.0, 1.0));
+    SetRandomSeed(42);
+    for (double x : first)
+        EXPECT_EQ(Random(-1.0, 1.0), x);
+    for (double x : first)
+        EXPECT_TRUE(x >= -1.0 && x < 1.0);
+    SetRandomSeed(43);
+    EXPECT_NE(Random(-1.0, 1.0), first[0]);
+    // The documented generator: the first value for seed 0 is pinned, on every platform.
+    SetRandomSeed(0);
+    EXPECT_EQ(Random(0.0, 1.0), 0.6012629994179048);
+}
+
+TEST(TimerAndDate, TimerIsMonotonicAndDelayWaits) {
+    double const start = Timer();
+    Delay(0.02);
+    double const elapsed = Timer() - start;
+    EXPECT_GE(elapsed, 0.02);
+    Delay(-1.0); // returns at once
+    Delay(std::numeric_limits<double>::quiet_NaN());
+    EXPECT_LT(Timer() - start, 5.0);
+}
+
+TEST(TimerAndDate, InternationalForms) {
+    platform::LocalDateTime const when{2024, 3, 7, 9, 5, 59};
+    char buffer[16];
+    EXPECT_EQ(toolbox::FormatInternationalDate(when, buffer, 11), 10);
+    EXPECT_STREQ(buffer, "2024-03-07");
+    EXPECT_EQ(toolbox::FormatInternationalTime(when, buffer, 9), 8);
+    EXPECT_STREQ(buffer, "09:05:59");
+    std::strcpy(buffer, "same");
+    EXPECT_EQ(toolbox::FormatInternationalDate(when, buffer, 10), TE_INVALID_OR_OUT_OF_RANGE);
+    EXPECT_EQ(toolbox::FormatInternationalDate({12024, 1, 1, 0, 0, 0}, buffer, 16),
+              TE_INVALID_OR_OUT_OF_RANGE);
+    EXPECT_STREQ(buffer, "same");
+    // Today's forms have the shapes above.
+    EXPECT_EQ(InternationalDate(buffer, sizeof buffer), 10);
+    EXPECT_EQ(buffer[4], '-');
+    EXPECT_EQ(InternationalTime(buffer, sizeof buffer), 8);
+    EXPECT_EQ(buffer[2], ':');
+    EXPECT_EQ(InternationalTime(nullptr, 9), TE_INVALID_POINTER);
+}
+
+TEST(Sound, RefusesArgumentsOutOfRange) {
+    EXPECT_EQ(TBTone(10, 100), 0);
+    EXPECT_EQ(TBTone(440, -1), 0);
+#if !defined(_WIN32)
+    EXPECT_EQ(TBBeep(), 0); // documented as not played on POSIX
+    EXPECT_EQ(TBTone(440, 10), 0);
+#endif
+}
+
+} // namespace
