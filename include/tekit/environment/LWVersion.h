@@ -15,10 +15,12 @@
 //
 // The fixed tests (LWVersionIs80OrGreater ...) parse no numbers: they look at single
 // characters, the way a two-digit major was once told apart from a one-digit one, and keep
-// that behaviour exactly. A three-digit major passes every test; "13.1" is not 13.0.1 or
-// greater and "14.1" not 14.0.1 or greater (only 13.0.x and 14.0.x with x at least 1, or a
-// higher major, pass those two). Characters are compared as unsigned bytes, so a byte above
-// 0x7F is "higher" than any digit. A null text is treated as empty text everywhere.
+// that behaviour exactly: "13.1" is not 13.0.1 or greater and "14.1" not 14.0.1 or greater
+// (only 13.0.x and 14.0.x with x at least 1, or a higher major, pass those two). The character
+// rules decide even where a number would not: "100.0" passes the 10.0 test but fails the
+// 11.0-and-up ones, as its second character is "0". Characters are compared as unsigned
+// bytes, so a byte above 0x7F is "higher" than any digit. A null text is treated as empty
+// text everywhere.
 #pragma once
 
 #include "tekit/Export.h"
