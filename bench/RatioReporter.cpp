@@ -1,3 +1,4 @@
+// The ratio table printed after a benchmark run: tekit's median CPU time against each peer's.
 #include "RatioReporter.h"
 
 #include <algorithm>
@@ -15,25 +16,33 @@ double Median(std::vector<double> values) {
     return values.size() % 2 ? values[middle] : (values[middle - 1] + values[middle]) / 2;
 }
 
-/// One line of the ratio table: name, own time, the baseline's time, ratio.
-std::string Line(std::string const& name, std::string const& own, std::string const& theirs,
-                 std::string const& ratio) {
-    char text[160];
-    std::snprintf(text, sizeof text, "%-28s %12s %12s %7s\n", name.c_str(), own.c_str(),
-                  theirs.c_str(), ratio.c_str());
+/// A time with a unit that keeps three significant digits or so.
+std::string Time(double nanoseconds) {
+    char text[32];
+    if (nanoseconds >= 1e6)
+        std::snprintf(text, sizeof text, "%.2f ms", nanoseconds / 1e6);
+    else if (nanoseconds >= 1e4)
+        std::snprintf(text, sizeof text, "%.1f us", nanoseconds / 1e3);
+    else
+        std::snprintf(text, sizeof text, "%.1f ns", nanoseconds);
     return text;
 }
 
-std::string Format(char const* format, double value) {
-    char text[32];
-    std::snprintf(text, sizeof text, format, value);
+/// One line of the table: case, tekit's time, peer, the peer's time, ratio.
+std::string Line(std::string const& name, std::string const& own, std::string const& peer,
+                 std::string const& theirs, std::string const& ratio) {
+    char text[200];
+    std::snprintf(text, sizeof text, "%-30s %11s   %-10s %11s %7s\n", name.c_str(), own.c_str(),
+                  peer.c_str(), theirs.c_str(), ratio.c_str());
     return text;
 }
 
 } // namespace
 
-RatioReporter::RatioReporter(std::string baseline)
-    : benchmark::ConsoleReporter(OO_Tabular), m_baseline(std::move(baseline)) {}
+RatioReporter::RatioReporter(std::vector<std::string> peers)
+    : benchmark::ConsoleReporter(OO_Tabular), m_peers(std::move(peers)) {}
+
+RatioReporter::RatioReporter(std::string peer) : RatioReporter(std::vector{std::move(peer)}) {}
 
 void RatioReporter::ReportRuns(std::vector<Run> const& runs) {
     ConsoleReporter::ReportRuns(runs);
@@ -43,7 +52,11 @@ void RatioReporter::ReportRuns(std::vector<Run> const& runs) {
         // CPU time: on a shared machine wall time also counts the time other programs ran.
         double const nanoseconds =
             run.GetAdjustedCPUTime() / benchmark::GetTimeUnitMultiplier(run.time_unit) * 1e9;
-        m_times[run.benchmark_name()].push_back(nanoseconds);
+        std::string const name = run.benchmark_name();
+        auto& times = m_times[name];
+        if (times.empty())
+            m_order.push_back(name);
+        times.push_back(nanoseconds);
     }
 }
 
@@ -51,22 +64,29 @@ void RatioReporter::Finalize() {
     ConsoleReporter::Finalize();
     std::ostream& out = GetOutputStream();
     bool headerPrinted = false;
-    for (auto const& [name, times] : m_times) {
+    for (std::string const& name : m_order) {
         size_t const slash = name.rfind('/');
         if (slash == std::string::npos ||
-            name.compare(slash + 1, std::string::npos, m_baseline) == 0)
+            std::find(m_peers.begin(), m_peers.end(), name.substr(slash + 1)) != m_peers.end())
             continue;
-        auto const peer = m_times.find(name.substr(0, slash + 1) + m_baseline);
-        if (peer == m_times.end())
-            continue;
-        if (!headerPrinted) {
-            out << "\nTime as a ratio of " << m_baseline << "'s (below 1: faster)\n"
-                << Line("benchmark", "CPU time", m_baseline, "ratio");
-            headerPrinted = true;
+        std::string const operation = name.substr(0, slash);
+        double const own = Median(m_times[name]);
+        bool first = true;
+        for (std::string const& peer : m_peers) {
+            auto const theirs = m_times.find(operation + "/" + peer);
+            if (theirs == m_times.end())
+                continue;
+            if (!headerPrinted) {
+                out << "\nTime as a ratio of the peer's (below 1: tekit is faster)\n"
+                    << Line("benchmark", "CPU time", "peer", "peer time", "ratio");
+                headerPrinted = true;
+            }
+            double const peerTime = Median(theirs->second);
+            char ratio[16];
+            std::snprintf(ratio, sizeof ratio, "%.2f", peerTime > 0 ? own / peerTime : 0.0);
+            out << Line(first ? name : "", first ? Time(own) : "", peer, Time(peerTime), ratio);
+            first = false;
         }
-        double const own = Median(times), theirs = Median(peer->second);
-        out << Line(name, Format("%.1f ns", own), Format("%.1f ns", theirs),
-                    Format("%.2f", theirs > 0 ? own / theirs : 0.0));
     }
 }
 

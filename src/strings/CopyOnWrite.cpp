@@ -17,7 +17,7 @@ namespace tekit {
 namespace {
 
 /// The block that copies, resizes of shared blocks and SetContents create: counted with
-/// interlocked operations and deleted by its last Release.
+/// interlocked operations and deleted by its last Release (see Share and Drop).
 class HeapCopyOnWriteMemory final : public CopyOnWriteMemory {
 public:
     CopyOnWriteMemory* AddRef() const override {
@@ -25,22 +25,28 @@ public:
         return const_cast<HeapCopyOnWriteMemory*>(this);
     }
     void Release() const override {
-        if (std::atomic_ref<std::int32_t>(m_refCount).fetch_sub(1, std::memory_order_acq_rel) == 1)
+        if (GetRefCount() == 1 ||
+            std::atomic_ref<std::int32_t>(m_refCount).fetch_sub(1, std::memory_order_acq_rel) == 1)
             delete this;
     }
 };
 
 constexpr char kFunction[] = "CopyOnWriteMemory::ResizeBuffer";
 
-/// The size a private resize allocates, or -1 when it would not fit a 32-bit int. A process
-/// cannot get a block near 2 GB anyway, so such a size is an allocation failure rather than a
-/// wrapped (and too small) request.
-long long RoundedSize(int size, int bufferSize, bool exactSize) {
-    long long want = std::max(size, 0);
-    if (!exactSize && size > bufferSize)
-        want += 4 + (size >> 5);
-    want = (want + 3) & ~3LL;
-    return want > INT_MAX ? -1 : want;
+/// Buffers up to this size are allocated in whole size classes.
+constexpr int kLargestSizeClass = 256;
+
+/// The bytes to allocate under a buffer of `size` bytes. A buffer that grows takes a power of
+/// two from 32 up to kLargestSizeClass, so a run of short appends calls the heap once per size
+/// class instead of at every step of the growth rule; the buffer size itself still follows
+/// the rule. Larger and exact sizes are allocated as they are.
+int AllocationFor(int size, bool exactSize) {
+    if (exactSize || size > kLargestSizeClass)
+        return size;
+    int sizeClass = 32;
+    while (sizeClass < size)
+        sizeClass <<= 1;
+    return sizeClass;
 }
 
 } // namespace
@@ -60,13 +66,15 @@ CopyOnWriteMemory::CopyOnWriteMemory(unsigned char const* bytes, int size, bool 
 
 CopyOnWriteMemory::CopyOnWriteMemory(CopyOnWriteMemory const& other)
     : m_bufferSize(other.m_bufferSize), m_data(other.m_data), m_ownsData(other.m_ownsData),
-      m_refCount(other.GetRefCount()) {}
+      m_refCount(other.GetRefCount()), m_allocated(other.m_allocated) {}
 
+// The kind (heap or not) stays: it belongs to the object, not to the fields it copies.
 CopyOnWriteMemory& CopyOnWriteMemory::operator=(CopyOnWriteMemory const& other) {
     m_bufferSize = other.m_bufferSize;
     m_data = other.m_data;
     m_ownsData = other.m_ownsData;
     m_refCount = other.GetRefCount();
+    m_allocated = other.m_allocated;
     return *this;
 }
 
@@ -89,18 +97,31 @@ std::int32_t CopyOnWriteMemory::GetRefCount() const {
 }
 
 CopyOnWriteMemory* CopyOnWriteMemory::NewHeapBlock() {
-    return new HeapCopyOnWriteMemory;
+    CopyOnWriteMemory* block = new HeapCopyOnWriteMemory;
+    block->m_counted = true;
+    return block;
 }
 
 void CopyOnWriteMemory::PrivateResize(int size, bool keepContents, bool exactSize) {
     if (!exactSize && size <= m_bufferSize)
         return; // buffers never shrink unless asked to
-    long long const rounded = RoundedSize(size, m_bufferSize, exactSize);
-    if (rounded < 0)
+    // A size that does not fit a 32-bit int is an allocation failure rather than a wrapped (and
+    // too small) request: a process cannot get a block near 2 GB anyway.
+    long long const rounded =
+        !exactSize ? GrownSize(size) : (static_cast<long long>(std::max(size, 0)) + 3) & ~3LL;
+    if (rounded > INT_MAX)
         TE_RAISE(TE_OUT_OF_MEMORY, "", kFunction);
     auto const newSize = static_cast<int>(rounded);
-    size_t const allocBytes = std::max<size_t>(size_t(newSize), 1); // malloc(0) may give null
-    if (m_ownsData && keepContents) {
+    if (m_ownsData && !exactSize && newSize <= m_allocated) {
+        m_bufferSize = newSize; // the allocation already holds the grown buffer
+        return;
+    }
+    int const allocation = AllocationFor(newSize, exactSize);
+    size_t const allocBytes = std::max<size_t>(size_t(allocation), 1); // malloc(0) may give null
+    // A block of size classes moves to the next class by a fresh allocation and a copy of at
+    // most kLargestSizeClass bytes: the heap's per-thread caches serve that at a fraction of
+    // what a reallocation costs. Larger blocks reallocate, which may grow in place.
+    if (m_ownsData && keepContents && m_allocated > kLargestSizeClass) {
         void* grown = std::realloc(m_data, allocBytes);
         if (!grown)
             TE_RAISE(TE_OUT_OF_MEMORY, "", kFunction);
@@ -110,19 +131,20 @@ void CopyOnWriteMemory::PrivateResize(int size, bool keepContents, bool exactSiz
         auto* fresh = static_cast<unsigned char*>(std::malloc(allocBytes));
         if (!fresh)
             TE_RAISE(TE_OUT_OF_MEMORY, "", kFunction);
-        if (!m_ownsData && keepContents && m_data && m_bufferSize > 0)
+        if (keepContents && m_data && m_bufferSize > 0)
             std::memcpy(fresh, m_data, size_t(std::min(m_bufferSize, newSize)));
         if (m_ownsData)
             std::free(m_data);
         m_data = fresh;
         m_ownsData = true;
     }
+    m_allocated = allocation;
     m_bufferSize = newSize;
 }
 
 int CopyOnWriteMemory::ResizeBuffer(CopyOnWriteMemory** holder, int size, bool keepContents,
                                     bool exactSize) {
-    if (GetRefCount() == 1) {
+    if (IsExclusive()) {
         PrivateResize(size, keepContents, exactSize);
         return (*holder)->m_bufferSize;
     }
@@ -140,12 +162,12 @@ int CopyOnWriteMemory::ResizeBuffer(CopyOnWriteMemory** holder, int size, bool k
     }
     CopyOnWriteMemory const* old = *holder;
     *holder = fresh;
-    old->Release();
+    old->Drop();
     return fresh->m_bufferSize;
 }
 
 unsigned char* CopyOnWriteMemory::GetWritePtr(CopyOnWriteMemory** holder) {
-    if (GetRefCount() == 1)
+    if (IsExclusive())
         return m_data;
     CopyOnWriteMemory* fresh = NewHeapBlock();
     try {
@@ -158,7 +180,7 @@ unsigned char* CopyOnWriteMemory::GetWritePtr(CopyOnWriteMemory** holder) {
         std::memcpy(fresh->m_data, m_data, size_t(std::min(m_bufferSize, fresh->m_bufferSize)));
     CopyOnWriteMemory const* old = *holder;
     *holder = fresh;
-    old->Release();
+    old->Drop();
     return fresh->m_data;
 }
 
@@ -182,18 +204,18 @@ void CopyOnWriteMemory::SetContents(CopyOnWriteMemory** holder, CopyOnWriteMemor
     if (*holder == other)
         return;
     CopyOnWriteMemory const* old = *holder;
-    *holder = other->AddRef(); // add first, release second
-    old->Release();
+    *holder = other->Share(); // add first, release second
+    old->Drop();
 }
 
 void CopyOnWriteMemory::SetContentsToConstant(CopyOnWriteMemory** holder,
                                               unsigned char const* bytes, int size) {
     CopyOnWriteMemory* target = *holder;
-    if (target->GetRefCount() != 1) {
+    if (!target->IsExclusive()) {
         target = NewHeapBlock();
         CopyOnWriteMemory const* old = *holder;
         *holder = target;
-        old->Release();
+        old->Drop();
     }
     target->ClearAll();
     target->m_data = const_cast<unsigned char*>(bytes);
@@ -206,6 +228,7 @@ void CopyOnWriteMemory::ClearAll() {
         std::free(m_data);
     m_data = nullptr;
     m_ownsData = false;
+    m_allocated = 0;
 }
 
 GlobalConstantCopyOnWriteMemory::GlobalConstantCopyOnWriteMemory(unsigned char const* bytes,

@@ -1,7 +1,7 @@
 // The decimal point of numbers: the period or the user's decimal separator.
 #include "tekit/strings/DecimalPoint.h"
 
-#include "platform/Platform.h"
+#include "platform/Locale.h"
 #include "strings/MultiByte.h"
 #include "tekit/strings/DynamicString.h"
 #include "tekit/strings/String.h"

@@ -4,17 +4,15 @@
 #include "tekit/strings/CopyOnWriteMemory.h"
 
 #include <algorithm>
+#include <climits>
+#include <cstdint>
 #include <cstring>
 
 namespace tekit {
 
-namespace {
-
-CopyOnWriteMemory* SharedEmpty() {
+CopyOnWriteMemory* DynamicString::SharedEmpty() {
     return String::EmptyStrCOWM()->AddRef();
 }
-
-} // namespace
 
 DynamicString::DynamicString() : m_memory(SharedEmpty()) {}
 
@@ -24,7 +22,7 @@ DynamicString::DynamicString(int numBytes) : m_memory(SharedEmpty()) {
 
 DynamicString::DynamicString(char const* text, bool copy) : m_memory(SharedEmpty()) {
     if (copy) {
-        String::Assign(text);
+        *this = text;
         return;
     }
     if (!text || *text == '\0')
@@ -37,9 +35,6 @@ DynamicString::DynamicString(char const* text, bool copy) : m_memory(SharedEmpty
 DynamicString::DynamicString(String const& other) : m_memory(SharedEmpty()) {
     Assign(other);
 }
-
-DynamicString::DynamicString(DynamicString const& other)
-    : String(other), m_memory(other.m_memory ? other.m_memory->AddRef() : SharedEmpty()) {}
 
 DynamicString::DynamicString(DynamicString&& other) noexcept
     : String(other), m_memory(other.m_memory) {
@@ -54,16 +49,6 @@ DynamicString::DynamicString(wchar_t const* text) : m_memory(SharedEmpty()) {
 }
 
 DynamicString::DynamicString(ForDynamicStringNullMemoryReference) : m_memory(nullptr) {}
-
-DynamicString::~DynamicString() {
-    if (m_memory)
-        m_memory->Release();
-}
-
-DynamicString& DynamicString::operator=(DynamicString const& other) {
-    Assign(other);
-    return *this;
-}
 
 DynamicString& DynamicString::operator=(DynamicString&& other) noexcept {
     if (this == &other)
@@ -84,9 +69,54 @@ DynamicString& DynamicString::operator=(String const& other) {
     return *this;
 }
 
+// In place when the block is this string's alone and has room: what the general assignment
+// would do, without its storage calls.
 DynamicString& DynamicString::operator=(char const* text) {
+    size_t const n = text ? std::strlen(text) : 0;
+    if (n > 0 && n < size_t(INT_MAX) - 16) {
+        char* data = OwnBuffer(int(n) + 1);
+        if (!data && !PointsIntoBlock(text))
+            data = FreshBuffer(int(n) + 1);
+        if (data) {
+            std::memmove(data, text, n); // the text may lie in this buffer
+            data[n] = '\0';
+            SetCachedSize(int(n) + 1);
+            return *this;
+        }
+    }
     String::Assign(text);
     return *this;
+}
+
+char* DynamicString::FreshBuffer(int numBytes) {
+    if (!m_memory || (m_memory->IsExclusive() && !m_memory->OwnsData()))
+        return nullptr;
+    if (m_memory->IsExclusive()) {
+        m_memory->PrivateResize(numBytes, false, false);
+    } else {
+        CopyOnWriteMemory* fresh = CopyOnWriteMemory::NewHeapBlock();
+        try {
+            fresh->PrivateResize(numBytes, false, false);
+        } catch (...) {
+            fresh->Drop();
+            throw;
+        }
+        CopyOnWriteMemory const* old = m_memory;
+        m_memory = fresh;
+        old->Drop();
+    }
+    char* data = reinterpret_cast<char*>(m_memory->m_data);
+    data[0] = '\0';
+    SetCachedSize(1);
+    return data;
+}
+
+bool DynamicString::PointsIntoBlock(char const* p) const {
+    if (!m_memory)
+        return false;
+    auto const start = reinterpret_cast<std::uintptr_t>(m_memory->GetReadPtr());
+    return reinterpret_cast<std::uintptr_t>(p) - start <
+           std::uintptr_t(std::max(m_memory->GetBufferSize(), 0));
 }
 
 DynamicString& DynamicString::operator=(wchar_t const* text) {
@@ -120,8 +150,43 @@ void DynamicString::Assign(String const& other) {
     String::Assign(other);
 }
 
-void DynamicString::Assign(DynamicString const& other) {
+void DynamicString::AssignUnshared(DynamicString const& other) {
     Assign(static_cast<String const&>(other));
+}
+
+// ---- Appending ------------------------------------------------------------------------
+
+// A block of this string's own grows in place by the growth rule; anything else (a shared
+// block, constant text, an unknown size, a text from this very buffer that growing could
+// move, a count that ends inside a double-byte character) takes the general path.
+void DynamicString::AppendText(char const* text, int numBytes) {
+    if (numBytes <= 0)
+        return;
+    int const size = GetCachedSize();
+    if (size <= 0 || numBytes >= INT_MAX - 16 - size ||
+        (text[numBytes] != '\0' && IsMultiByteSupportEnabled())) {
+        AppendBytes(text, numBytes);
+        return;
+    }
+    int const needed = size + numBytes;
+    char* data = OwnBuffer(size);
+    if (!data && size == 1 && !PointsIntoBlock(text))
+        data = FreshBuffer(needed); // the first text of an empty string
+    if (!data) {
+        AppendBytes(text, numBytes);
+        return;
+    }
+    if (needed > m_memory->m_bufferSize && !m_memory->GrowWithinAllocation(needed)) {
+        if (PointsIntoBlock(text)) {
+            AppendBytes(text, numBytes);
+            return;
+        }
+        m_memory->PrivateResize(needed, true, false);
+        data = reinterpret_cast<char*>(m_memory->m_data);
+    }
+    std::memmove(data + size - 1, text, size_t(numBytes)); // may lie after the text
+    data[needed - 1] = '\0';
+    SetCachedSize(needed);
 }
 
 // Clearing never writes into the block, so clearing a shared string never copies it.
@@ -135,13 +200,11 @@ bool DynamicString::IsGlobalConstant() const {
     return m_memory && m_memory->IsGlobalConstant();
 }
 
-char const* DynamicString::GetBufferReadPtr() const {
-    if (!m_memory || !m_memory->GetReadPtr())
-        return "";
-    return reinterpret_cast<char const*>(m_memory->GetReadPtr());
-}
-
 char* DynamicString::GetBufferWritePtr() {
+    if (char* data = OwnBuffer(1)) {
+        InvalSizeCache();
+        return data;
+    }
     EnsureMemory();
     if (!m_memory->GetReadPtr() || m_memory->GetBufferSize() < 1) {
         RequestBufferSize(1, false, false);
@@ -152,21 +215,21 @@ char* DynamicString::GetBufferWritePtr() {
     return reinterpret_cast<char*>(m_memory->GetWritePtr(&m_memory));
 }
 
-int DynamicString::GetBufferSize() const {
-    if (!m_memory || !m_memory->GetReadPtr())
-        return 1; // the empty text ""
-    return m_memory->GetBufferSize();
-}
-
-CopyOnWriteMemory* DynamicString::GetCopyOnWriteMemory() const {
-    return m_memory;
-}
-
 // Asks the block for max(numBytes, 1) bytes. Afterwards the block is this string's alone and
 // owns its bytes, so a write may follow; without `keepContents` the text is then empty.
 int DynamicString::RequestBufferSize(int numBytes, bool keepContents, bool exactSize) {
-    EnsureMemory();
     numBytes = std::max(numBytes, 1);
+    char* data = exactSize ? nullptr : OwnBuffer(numBytes);
+    int const bufferSize = data ? m_memory->GetBufferSize() : 0;
+    if (data && !keepContents) {
+        // Room enough in a block of this string's own: nothing to resize.
+        data[0] = '\0';
+        SetCachedSize(1);
+        return bufferSize;
+    }
+    if (data && GetCachedSize() > 0 && GetCachedSize() <= bufferSize)
+        return bufferSize; // and the known text already fits with its terminator
+    EnsureMemory();
     if (HoldsConstantAlone() && !exactSize && numBytes <= m_memory->GetBufferSize()) {
         // Constant text held alone would be written in place: take an owned copy instead.
         exactSize = true;
@@ -191,7 +254,7 @@ int DynamicString::RequestBufferSize(int numBytes, bool keepContents, bool exact
 }
 
 bool DynamicString::HoldsConstantAlone() const {
-    return m_memory && m_memory->GetRefCount() == 1 && !m_memory->OwnsData();
+    return m_memory && m_memory->IsExclusive() && !m_memory->OwnsData();
 }
 
 int DynamicString::Reserve(int numBytes, bool exactSize) {

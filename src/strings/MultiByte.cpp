@@ -1,7 +1,7 @@
 // The multibyte character operations over the process-wide lead-byte table.
 #include "strings/MultiByte.h"
 
-#include "platform/Platform.h"
+#include "platform/CodePage.h"
 #include "tekit/strings/MultiByte.h"
 
 #include <atomic>

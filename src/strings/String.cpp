@@ -70,9 +70,7 @@ GlobalConstantCopyOnWriteMemory* String::EmptyStrCOWM() {
 
 // ---- Measures ---------------------------------------------------------------------------
 
-int String::GetNumBytes() const {
-    if (m_cachedSize > 0)
-        return m_cachedSize - 1;
+int String::MeasureNumBytes() const {
     // Measured within the buffer, so a caller's buffer without a terminator is never overrun.
     char const* p = GetBufferReadPtr();
     int const limit = GetBufferSize();

@@ -7,6 +7,7 @@
 
 #include <algorithm>
 #include <climits>
+#include <cstdint>
 #include <cstring>
 #include <string>
 
@@ -34,9 +35,22 @@ void CopyBytes(char* dest, char const* src, int numBytes, int destSize, int* cac
 
 /// True when `p` points into the buffer of `s` (a source that a resize could move or free).
 bool PointsInto(String const& s, char const* p) {
-    char const* start = s.GetBufferReadPtr();
-    int const size = s.GetBufferSize();
-    return p && start && size > 0 && p >= start && p < start + size;
+    auto const address = reinterpret_cast<std::uintptr_t>(p);
+    auto const start = reinterpret_cast<std::uintptr_t>(s.GetBufferReadPtr());
+    return address - start < std::uintptr_t(std::max(s.GetBufferSize(), 0));
+}
+
+/// Copies `numBytes` bytes of `src`, which holds no NUL among them, into `dest` of `destSize`
+/// bytes. When they fit they are copied whole, as both modes do unless the count ends inside a
+/// double-byte character; otherwise they are cut as the current mode cuts.
+void CopyKnownBytes(char* dest, char const* src, int numBytes, int destSize, int* cachedSize) {
+    if (numBytes < destSize && (!String::IsMultiByteSupportEnabled() || src[numBytes] == '\0')) {
+        std::memmove(dest, src, size_t(numBytes));
+        dest[numBytes] = '\0';
+        *cachedSize = numBytes + 1;
+        return;
+    }
+    CopyBytes(dest, src, numBytes, destSize, cachedSize);
 }
 
 } // namespace
@@ -69,24 +83,24 @@ void String::AssignUsingNumBytesInsteadOfNumChars(char const* text, int numBytes
         return;
     }
     int const n = TextBytes(text, numBytes, "String::Assign");
-    std::string own;
     if (PointsInto(*this, text)) {
-        own.assign(text, size_t(n));
-        text = own.c_str();
+        std::string const own(text, size_t(n));
+        AssignUsingNumBytesInsteadOfNumChars(own.c_str(), n, false);
+        return;
     }
     int const available = RequestBufferSize(n + 1, false, false);
     char* dest = GetBufferWritePtr();
-    CopyBytes(dest, text, n, available, &m_cachedSize);
+    CopyKnownBytes(dest, text, n, available, &m_cachedSize);
 }
 
 void String::AppendBytes(char const* text, int numBytes) {
     int const n = TextBytes(text, numBytes, "String::Append");
     if (n == 0)
         return;
-    std::string own;
     if (PointsInto(*this, text)) {
-        own.assign(text, size_t(n));
-        text = own.c_str();
+        std::string const own(text, size_t(n));
+        AppendBytes(own.c_str(), n);
+        return;
     }
     int const length = GetNumBytes();
     int const available = RequestBufferSize(length + n + 1, true, false);
@@ -94,7 +108,7 @@ void String::AppendBytes(char const* text, int numBytes) {
         return; // no room for even one byte and the terminator
     char* dest = GetBufferWritePtr();
     int copied = 0;
-    CopyBytes(dest + length, text, n, available - length, &copied);
+    CopyKnownBytes(dest + length, text, n, available - length, &copied);
     SetCachedSize(length + std::max(copied, 1));
 }
 

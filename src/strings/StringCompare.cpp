@@ -15,13 +15,10 @@ int Sign(int v) {
     return v < 0 ? -1 : (v > 0 ? 1 : 0);
 }
 
-/// Unsigned byte comparison of two whole texts: -1, 0 or 1.
+/// Unsigned byte comparison of two whole texts: -1, 0 or 1 (strcmp compares bytes as unsigned
+/// char, a word at a time).
 int CompareBytes(char const* a, char const* b) {
-    auto const* pa = reinterpret_cast<unsigned char const*>(a);
-    auto const* pb = reinterpret_cast<unsigned char const*>(b);
-    for (; *pa != 0 && *pa == *pb; ++pa, ++pb) {
-    }
-    return Sign(int(*pa) - int(*pb));
+    return Sign(std::strcmp(a, b));
 }
 
 long CompareTexts(char const* a, char const* b, bool ignoreCase, int numChars) {

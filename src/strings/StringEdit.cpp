@@ -91,8 +91,8 @@ void String::ReplaceSubstring(int start, int numChars, char const* replacement) 
     int const numBytes = GetNumBytes();
     int const offset = detail::OffsetOfChar(text, numBytes, start, mb);
     int const bytes = BytesOfChars(text, numBytes, offset, numChars, mb);
-    detail::Splice(*this, numBytes, offset, bytes, insert,
-                   [this](int size) { SetCachedSize(size); });
+    detail::Replace(*this, numBytes, offset, bytes, insert,
+                    [this](int size) { SetCachedSize(size); });
 }
 
 bool String::ReplaceSubstring(String const& find, String const& replacement, bool ignoreCase,
@@ -110,8 +110,8 @@ bool String::ReplaceSubstring(char const* find, char const* replacement, bool ig
     if (at < 0)
         return false;
     detail::StableText const insert(*this, replacement, -1);
-    detail::Splice(*this, numBytes, at, needle.bytes, insert,
-                   [this](int size) { SetCachedSize(size); });
+    detail::Replace(*this, numBytes, at, needle.bytes, insert,
+                    [this](int size) { SetCachedSize(size); });
     return true;
 }
 

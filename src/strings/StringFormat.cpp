@@ -7,6 +7,7 @@
 
 #include <charconv>
 #include <climits>
+#include <cstring>
 #include <functional>
 #include <string>
 
@@ -24,15 +25,25 @@ bool PointsInto(String const& s, char const* text) {
     return lessEqual(begin, text) && std::less<char const*>()(text, begin + s.GetBufferSize() + 1);
 }
 
-/// Builds the placeholder text "%<number>" and replaces its first occurrence by `argument`;
-/// false when the text holds no such placeholder.
-bool ReplacePlaceholder(String& s, StaticString<64>& placeholder, long number,
-                        char const* argument) {
-    char text[32] = "%";
-    *std::to_chars(text + 1, text + sizeof text - 1, number).ptr = '\0';
-    placeholder = text;
-    return s.ReplaceSubstring(text, argument, false, false);
+/// The placeholder text "%<number>" (the format "%%%d").
+struct Placeholder {
+    char text[24] = "%";
+    explicit Placeholder(long number) {
+        *std::to_chars(text + 1, text + sizeof text - 1, number).ptr = '\0';
+    }
+};
+
+/// True when `printfFormat` asks for nothing but the decimal digits of a value of the type
+/// whose own format is `defaultFormat` (null asks for that format).
+bool IsPlainDecimal(char const* printfFormat, char const* defaultFormat) {
+    return printfFormat == nullptr || std::strcmp(printfFormat, defaultFormat) == 0;
 }
+
+/// The decimal digits of `value`, terminated.
+template <class T> struct Digits {
+    char text[24];
+    explicit Digits(T value) { *std::to_chars(text, text + sizeof text - 1, value).ptr = '\0'; }
+};
 
 /// Writes `value` with `printfFormat` and fills placeholder `number` with it.
 void FormatValue(String& s, Value const& value, long number, char const* printfFormat,
@@ -58,6 +69,26 @@ template <class T> Value IntegerValue(T value) {
         return Value::Signed(static_cast<std::int64_t>(value), kind);
     else
         return Value::Unsigned(static_cast<std::uint64_t>(value), kind);
+}
+
+/// Fills placeholder `number` with an integer; the plain decimal formats (the defaults) are
+/// written with to_chars, without going through the field parser.
+template <class T>
+void FormatInteger(String& s, T value, long number, char const* printfFormat,
+                   char const* defaultFormat) {
+    if (IsPlainDecimal(printfFormat, defaultFormat))
+        s.Format(Digits<T>(value).text, number);
+    else
+        FormatValue(s, IntegerValue(value), number, printfFormat, defaultFormat);
+}
+
+/// Appends an integer, the plain decimal formats with to_chars.
+template <class T>
+void AppendInteger(String& s, T value, char const* printfFormat, char const* defaultFormat) {
+    if (IsPlainDecimal(printfFormat, defaultFormat))
+        s += Digits<T>(value).text;
+    else
+        AppendValue(s, IntegerValue(value), printfFormat, defaultFormat);
 }
 
 /// Writes a double: the shortest round-trip text for a null format.
@@ -91,9 +122,9 @@ void String::Format(String const& argument, long number) {
         Format(DynamicString(argument.GetBufferReadPtr(), true), number);
         return;
     }
-    StaticString<64> placeholder;
-    if (!ReplacePlaceholder(*this, placeholder, number, argument.GetBufferReadPtr()))
-        HandleMissingFormatArgument(placeholder, argument);
+    Placeholder const placeholder(number);
+    if (!ReplaceSubstring(placeholder.text, argument.GetBufferReadPtr(), false, false))
+        HandleMissingFormatArgument(StaticString<64>(placeholder.text), argument);
 }
 
 void String::Format(char const* argument, long number) {
@@ -103,23 +134,24 @@ void String::Format(char const* argument, long number) {
         Format(DynamicString(argument, true), number);
         return;
     }
-    StaticString<64> placeholder;
-    if (!ReplacePlaceholder(*this, placeholder, number, argument))
-        HandleMissingFormatArgument(placeholder, DynamicString(argument, false));
+    Placeholder const placeholder(number);
+    if (!ReplaceSubstring(placeholder.text, argument, false, false))
+        HandleMissingFormatArgument(StaticString<64>(placeholder.text),
+                                    DynamicString(argument, false));
 }
 
 // ---- Typed values --------------------------------------------------------------------------
 
 void String::Format(int value, long number, char const* printfFormat) {
-    FormatValue(*this, IntegerValue(value), number, printfFormat, "%d");
+    FormatInteger(*this, value, number, printfFormat, "%d");
 }
 
 void String::Format(long value, long number, char const* printfFormat) {
-    FormatValue(*this, IntegerValue(value), number, printfFormat, "%ld");
+    FormatInteger(*this, value, number, printfFormat, "%ld");
 }
 
 void String::Format(short value, long number, char const* printfFormat) {
-    FormatValue(*this, IntegerValue(value), number, printfFormat, "%hd");
+    FormatInteger(*this, value, number, printfFormat, "%hd");
 }
 
 void String::Format(char value, long number, char const* printfFormat) {
@@ -127,27 +159,27 @@ void String::Format(char value, long number, char const* printfFormat) {
 }
 
 void String::Format(unsigned char value, long number, char const* printfFormat) {
-    FormatValue(*this, IntegerValue(value), number, printfFormat, "%u");
+    FormatInteger(*this, value, number, printfFormat, "%u");
 }
 
 void String::Format(unsigned short value, long number, char const* printfFormat) {
-    FormatValue(*this, IntegerValue(value), number, printfFormat, "%hu");
+    FormatInteger(*this, value, number, printfFormat, "%hu");
 }
 
 void String::Format(unsigned int value, long number, char const* printfFormat) {
-    FormatValue(*this, IntegerValue(value), number, printfFormat, "%u");
+    FormatInteger(*this, value, number, printfFormat, "%u");
 }
 
 void String::Format(unsigned long value, long number, char const* printfFormat) {
-    FormatValue(*this, IntegerValue(value), number, printfFormat, "%lu");
+    FormatInteger(*this, value, number, printfFormat, "%lu");
 }
 
 void String::Format(long long value, long number, char const* printfFormat) {
-    FormatValue(*this, IntegerValue(value), number, printfFormat, "%lld");
+    FormatInteger(*this, value, number, printfFormat, "%lld");
 }
 
 void String::Format(unsigned long long value, long number, char const* printfFormat) {
-    FormatValue(*this, IntegerValue(value), number, printfFormat, "%llu");
+    FormatInteger(*this, value, number, printfFormat, "%llu");
 }
 
 void String::Format(double value, long number, kDecimalPointLocalizationOptions options,
@@ -166,27 +198,27 @@ void String::FormatPtr(std::uintptr_t value, long number, char const* printfForm
 // ---- Appending -----------------------------------------------------------------------------
 
 void String::Append(int value, char const* printfFormat) {
-    AppendValue(*this, IntegerValue(value), printfFormat, "%d");
+    AppendInteger(*this, value, printfFormat, "%d");
 }
 
 void String::Append(unsigned int value, char const* printfFormat) {
-    AppendValue(*this, IntegerValue(value), printfFormat, "%u");
+    AppendInteger(*this, value, printfFormat, "%u");
 }
 
 void String::Append(long value, char const* printfFormat) {
-    AppendValue(*this, IntegerValue(value), printfFormat, "%ld");
+    AppendInteger(*this, value, printfFormat, "%ld");
 }
 
 void String::Append(unsigned long value, char const* printfFormat) {
-    AppendValue(*this, IntegerValue(value), printfFormat, "%lu");
+    AppendInteger(*this, value, printfFormat, "%lu");
 }
 
 void String::Append(long long value, char const* printfFormat) {
-    AppendValue(*this, IntegerValue(value), printfFormat, "%lld");
+    AppendInteger(*this, value, printfFormat, "%lld");
 }
 
 void String::Append(unsigned long long value, char const* printfFormat) {
-    AppendValue(*this, IntegerValue(value), printfFormat, "%llu");
+    AppendInteger(*this, value, printfFormat, "%llu");
 }
 
 void String::Append(double value, kDecimalPointLocalizationOptions options,

@@ -107,4 +107,27 @@ void Splice(String& s, int length, int offset, int removeBytes, StableText const
         setSize(InsertBytes(s, length, offset, text.data(), text.size()));
 }
 
+/// Splice in one step when the storage holds the whole result: one resize at most and one move
+/// of the tail, instead of a removal and an insertion that may each resize. Storage that cannot
+/// hold the result takes Splice's way, so what it keeps is the same.
+template <class SetSize>
+void Replace(String& s, int length, int offset, int removeBytes, StableText const& text,
+             SetSize setSize) {
+    if (removeBytes == 0 && text.size() == 0)
+        return; // nothing changes: nothing is written
+    int const newLength = length - removeBytes + text.size();
+    if (static_cast<long long>(length) + text.size() < INT_MAX) {
+        int const wanted = std::max(newLength, length) + 1;
+        if (s.RequestBufferSize(wanted, true, false) >= wanted) {
+            char* p = s.GetBufferWritePtr();
+            std::memmove(p + offset + text.size(), p + offset + removeBytes,
+                         size_t(length - offset - removeBytes + 1));
+            std::memcpy(p + offset, text.data(), size_t(text.size()));
+            setSize(newLength + 1);
+            return;
+        }
+    }
+    Splice(s, length, offset, removeBytes, text, setSize);
+}
+
 } // namespace tekit::detail

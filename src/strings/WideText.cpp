@@ -1,7 +1,7 @@
 // Narrow text to wide and UTF-8 text and back; UTF-8 by portable code.
 #include "strings/WideText.h"
 
-#include "platform/Platform.h"
+#include "platform/TextConversion.h"
 #include "strings/MultiByte.h"
 
 #include <cstring>

@@ -11,9 +11,12 @@
 
 #include "tekit/Export.h"
 
+#include <atomic>
 #include <cstdint>
 
 namespace tekit {
+
+class DynamicString;
 
 class TEKIT_API CopyOnWriteMemory {
 public:
@@ -68,6 +71,51 @@ protected:
     unsigned char* m_data = nullptr;
     bool m_ownsData = false;
     mutable std::int32_t m_refCount = 1;
+
+private:
+    friend class DynamicString;
+
+    /// AddRef without a virtual call: a heap block is counted here, inline; any other kind
+    /// goes through its own AddRef.
+    CopyOnWriteMemory* Share() const {
+        if (!m_counted)
+            return AddRef();
+        std::atomic_ref<std::int32_t>(m_refCount).fetch_add(1, std::memory_order_relaxed);
+        return const_cast<CopyOnWriteMemory*>(this);
+    }
+    /// Release without a virtual call for a heap block. Its last holder deletes it without an
+    /// interlocked decrement: with a count of 1 nothing else can reach the block.
+    void Drop() const {
+        if (!m_counted) {
+            Release();
+        } else if (IsExclusive() || std::atomic_ref<std::int32_t>(m_refCount)
+                                            .fetch_sub(1, std::memory_order_acq_rel) == 1) {
+            delete this;
+        }
+    }
+    /// Grows the buffer of an owned block to hold `size` bytes (more than it has) by the growth
+    /// rule when the allocation under it already has the room; false when the heap must be
+    /// asked (PrivateResize).
+    bool GrowWithinAllocation(int size) {
+        long long const grown = GrownSize(size);
+        if (!m_ownsData || grown > m_allocated)
+            return false;
+        m_bufferSize = static_cast<int>(grown);
+        return true;
+    }
+    /// The growth rule: a buffer that must grow to `size` bytes gets size + 4 + size / 32
+    /// (arithmetic shift), rounded up to a multiple of 4.
+    static constexpr long long GrownSize(int size) {
+        return (static_cast<long long>(size) + 4 + (size >> 5) + 3) & ~3LL;
+    }
+    /// The exclusive test: one holder only, so the holder may write in place.
+    bool IsExclusive() const {
+        return std::atomic_ref<std::int32_t>(m_refCount).load(std::memory_order_acquire) == 1;
+    }
+    /// Bytes at `m_data` when owned: the buffer size or more, as the heap allocation went.
+    int m_allocated = 0;
+    /// A heap block: counted with interlocked operations and deleted by its last Release.
+    bool m_counted = false;
 };
 
 /// A block over constant text that is never freed and never written: its count starts at 2,

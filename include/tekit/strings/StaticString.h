@@ -8,6 +8,8 @@
 
 #include "tekit/strings/String.h"
 
+#include <cstring>
+
 namespace tekit {
 
 template <int N> class StaticString : public String {
@@ -33,10 +35,34 @@ public:
         String::Assign(other);
         return *this;
     }
+    /// A text that fits is copied in place; a longer one is cut as every assignment cuts.
     StaticString& operator=(char const* text) {
-        String::Assign(text);
+        size_t const n = text ? strnlen(text, N + 1) : 0;
+        if (n == 0 || n > size_t(N)) {
+            String::Assign(text);
+            return *this;
+        }
+        std::memmove(m_buffer, text, n); // the text may lie in this buffer
+        m_buffer[n] = '\0';
+        SetCachedSize(int(n) + 1);
         return *this;
     }
+    /// A text that fits is appended in place; a longer one is cut as every append cuts.
+    String& operator+=(char const* text) final {
+        int const size = GetCachedSize();
+        if (text && size > 0 && size <= N + 1) {
+            size_t const room = size_t(N + 1 - size);
+            size_t const n = strnlen(text, room + 1);
+            if (n <= room) {
+                std::memmove(m_buffer + size - 1, text, n);
+                m_buffer[size - 1 + int(n)] = '\0';
+                SetCachedSize(size + int(n));
+                return *this;
+            }
+        }
+        return String::operator+=(text);
+    }
+    using String::operator+=;
 
     char const* GetBufferReadPtr() const override { return m_buffer; }
     char* GetBufferWritePtr() override {

@@ -105,7 +105,9 @@ public:
 
     // ---- Measures. ----------------------------------------------------------------------
     /// Bytes of text without the terminator (cached).
-    int GetNumBytes() const;
+    int GetNumBytes() const {
+        return m_cachedSize > 0 ? m_cachedSize - 1 : MeasureNumBytes();
+    }
     /// Characters of text: GetNumBytes() in single-byte mode.
     int GetNumChars() const;
     /// Bytes of text including the terminator.
@@ -696,6 +698,9 @@ protected:
     static bool m_isMultiByteSupportEnabled;
 
 private:
+    /// Measures the text within the buffer and caches its size.
+    int MeasureNumBytes() const;
+
     mutable int m_cachedSize = 1;
 };
 
