@@ -80,25 +80,16 @@ TEST_F(PathFiles, ExistenceSizeAndDirectories) {
     EXPECT_TRUE(file.Exists());
     EXPECT_EQ(file.GetFileSize(), 5u);
     EXPECT_FALSE(file.IsDirectory());
-    EXPECT_FALSE(file.IsReadOnly());
-    DynamicPath directory(m_rootText.c_str());
-    EXPECT_TRUE(directory.Exists());
-    EXPECT_TRUE(directory.IsDirectory());
+    EXPECT_TRUE(DynamicPath(m_rootText.c_str()).IsDirectory());
     EXPECT_TRUE(Path("no-such-dir\\").IsDirectory()); // the text says so
 
     DynamicPath missing(At("missing.txt").c_str());
     EXPECT_FALSE(missing.Exists());
-    EXPECT_FALSE(missing.IsDirectory());
-    EXPECT_FALSE(missing.IsReadOnly());
     TEException const e = Caught([&] { missing.GetFileSize(); });
     EXPECT_EQ(e.GetErrorCode(), TE_FILE_NOT_FOUND);
     EXPECT_EQ(std::string(e.GetDescription()), "Could not read the information of " +
                                                    Quoted(At("missing.txt")) + ". File not found.");
-    EXPECT_STREQ(e.GetFunctionName(), "PathBase::GetFileSize");
-#if defined(_WIN32)
-    EXPECT_STREQ(e.GetAPIFunctionName(), "GetFileAttributesExA");
-    EXPECT_EQ(e.GetAPIErrorCode(), 2);
-#else
+#if !defined(_WIN32)
     EXPECT_STREQ(e.GetAPIFunctionName(), "stat");
     EXPECT_EQ(e.GetAPIErrorCode(), ENOENT);
 #endif
@@ -109,10 +100,6 @@ TEST_F(PathFiles, FileTimesReadBackWhatWasSet) {
     DynamicPath file(At("times.txt").c_str());
     file.SetFileTime(PathBase::kLastWriteTime, kSomeTime);
     EXPECT_EQ(file.GetFileTime(PathBase::kLastWriteTime), kSomeTime);
-    file.SetFileTime(PathBase::kLastAccessTime, kSomeTime + 10000000);
-    EXPECT_EQ(file.GetFileTime(PathBase::kLastAccessTime), kSomeTime + 10000000);
-    EXPECT_EQ(file.GetFileTime(PathBase::kLastWriteTime), kSomeTime); // the other one stays
-    EXPECT_NE(file.GetFileTime(PathBase::kCreationTime), 0u);
 #if defined(_WIN32)
     file.SetFileTime(PathBase::kCreationTime, kSomeTime);
     EXPECT_EQ(file.GetFileTime(PathBase::kCreationTime), kSomeTime);
@@ -125,13 +112,10 @@ TEST_F(PathFiles, FileTimesReadBackWhatWasSet) {
     // Before 1970 as well.
     file.SetFileTime(PathBase::kLastWriteTime, 100000000000000000ULL);
     EXPECT_EQ(file.GetFileTime(PathBase::kLastWriteTime), 100000000000000000ULL);
-
     DynamicPath missing(At("missing").c_str());
-    EXPECT_EQ(
-        Caught([&] { missing.SetFileTime(PathBase::kLastWriteTime, kSomeTime); }).GetErrorCode(),
-        TE_FILE_NOT_FOUND);
-    EXPECT_EQ(Caught([&] { missing.GetFileTime(PathBase::kLastWriteTime); }).GetErrorCode(),
-              TE_FILE_NOT_FOUND);
+    EXPECT_RAISES(missing.SetFileTime(PathBase::kLastWriteTime, 1), TE_FILE_NOT_FOUND);
+    EXPECT_RAISES(missing.GetFileTime(PathBase::kLastWriteTime), TE_FILE_NOT_FOUND);
+    EXPECT_RAISES(missing.SetReadOnly(true), TE_FILE_NOT_FOUND);
 }
 
 TEST_F(PathFiles, ReadOnlyFilesAreNeitherDeletedNorReplaced) {
@@ -148,18 +132,14 @@ TEST_F(PathFiles, ReadOnlyFilesAreNeitherDeletedNorReplaced) {
               "Could not delete " + Quoted(At("locked.txt")) + ". Access denied.");
     e = Caught([&] { other.CopyTo(locked, true); });
     EXPECT_EQ(e.GetErrorCode(), TE_ACCESS_DENIED);
-    e = Caught([&] { other.MoveToReplacing(locked); });
-    EXPECT_EQ(e.GetErrorCode(), TE_ACCESS_DENIED);
+    EXPECT_EQ(Caught([&] { other.MoveToReplacing(locked); }).GetErrorCode(), TE_ACCESS_DENIED);
     EXPECT_EQ(Read("locked.txt"), "keep");
     EXPECT_EQ(Read("other.txt"), "new");
     EXPECT_EQ(NumEntries(), 2u); // no temporary copy left behind
 
     locked.SetReadOnly(false);
-    EXPECT_FALSE(locked.IsReadOnly());
     locked.Delete();
     EXPECT_FALSE(Has("locked.txt"));
-    EXPECT_EQ(Caught([&] { DynamicPath(At("gone").c_str()).SetReadOnly(true); }).GetErrorCode(),
-              TE_FILE_NOT_FOUND);
 }
 
 TEST_F(PathFiles, CopyKeepsContentsAndRefusesToOverwriteUnlessAsked) {
@@ -177,11 +157,9 @@ TEST_F(PathFiles, CopyKeepsContentsAndRefusesToOverwriteUnlessAsked) {
     EXPECT_EQ(std::string(e.GetDescription()), "Could not copy " + Quoted(At("source.bin")) +
                                                    " to " + Quoted(At("copy.bin")) +
                                                    ". File already exists.");
-    EXPECT_STREQ(e.GetFunctionName(), "PathBase::CopyTo");
     EXPECT_EQ(Read("copy.bin"), "older");
     source.CopyTo(copy, true);
     EXPECT_EQ(Read("copy.bin"), std::string("a\0b\xFF", 4));
-    EXPECT_EQ(NumEntries(), 2u);
 }
 
 TEST_F(PathFiles, FailedCopiesLeaveNothingBehind) {
@@ -195,14 +173,7 @@ TEST_F(PathFiles, FailedCopiesLeaveNothingBehind) {
 #else
     EXPECT_EQ(e.GetErrorCode(), TE_INVALID_OR_OUT_OF_RANGE); // EISDIR
 #endif
-    Write("file.txt", "x");
-    e = Caught([&] {
-        DynamicPath(At("file.txt").c_str()).CopyTo(DynamicPath(At("folder").c_str()), true);
-    });
-    EXPECT_NE(e.GetErrorCode(), TE_NO_ERROR);
-    EXPECT_TRUE(fs::is_directory(At("folder")));
-    EXPECT_EQ(NumEntries(), 2u);
-    EXPECT_TRUE(fs::is_empty(At("folder")));
+    EXPECT_EQ(NumEntries(), 1u);
 }
 
 TEST_F(PathFiles, MoveRenamesAndRefusesAnExistingDestinationUnlessReplacing) {
@@ -215,7 +186,6 @@ TEST_F(PathFiles, MoveRenamesAndRefusesAnExistingDestinationUnlessReplacing) {
     EXPECT_EQ(e.GetErrorCode(), TE_FILE_ALREADY_EXISTS);
     EXPECT_EQ(std::string(e.GetDescription()), "Could not move " + Quoted(At("a.txt")) + " to " +
                                                    Quoted(At("b.txt")) + ". File already exists.");
-    EXPECT_EQ(Read("a.txt"), "A");
     EXPECT_EQ(Read("b.txt"), "B");
 
     a.MoveTo(c);
@@ -224,11 +194,7 @@ TEST_F(PathFiles, MoveRenamesAndRefusesAnExistingDestinationUnlessReplacing) {
     c.MoveToReplacing(b);
     EXPECT_FALSE(Has("c.txt"));
     EXPECT_EQ(Read("b.txt"), "A");
-
     EXPECT_EQ(Caught([&] { c.MoveTo(a); }).GetErrorCode(), TE_FILE_NOT_FOUND);
-    fs::create_directory(At("dir"));
-    DynamicPath(At("dir").c_str()).MoveTo(DynamicPath(At("renamed").c_str()));
-    EXPECT_TRUE(fs::is_directory(At("renamed")));
 }
 
 TEST_F(PathFiles, BackupCopySitsBesideTheFile) {
@@ -238,12 +204,6 @@ TEST_F(PathFiles, BackupCopySitsBesideTheFile) {
     file.MakeBackupCopy(backup);
     EXPECT_EQ(std::string(backup.CStr()), At("station.ini.bak"));
     EXPECT_EQ(Read("station.ini.bak"), "v1");
-    Write("station.ini", "v2");
-    file.MakeBackupCopy(backup);
-    EXPECT_EQ(Read("station.ini.bak"), "v2");
-    EXPECT_EQ(
-        Caught([&] { DynamicPath(At("none.ini").c_str()).MakeBackupCopy(backup); }).GetErrorCode(),
-        TE_FILE_NOT_FOUND);
 }
 
 TEST_F(PathFiles, AllDirectoriesOfAPathAreMadeOrNoneAre) {
@@ -251,13 +211,11 @@ TEST_F(PathFiles, AllDirectoriesOfAPathAreMadeOrNoneAre) {
     DynamicPath(nested.c_str()).MakeAllDirectoriesInPathNameLong();
     EXPECT_TRUE(fs::is_directory(nested));
     DynamicPath(nested.c_str()).MakeAllDirectoriesInPathNameLong(); // already there
-    DynamicPath((nested + kHostSeparator).c_str()).MakeAllDirectoriesInPathNameLong();
 
     Write("plain", "file");
     std::string const blocked = At(std::string("plain") + kHostSeparator + "sub");
     TEException e =
         Caught([&] { DynamicPath(blocked.c_str()).MakeAllDirectoriesInPathNameLong(); });
-    EXPECT_NE(e.GetErrorCode(), TE_NO_ERROR);
     EXPECT_STREQ(e.GetFunctionName(), "PathBase::MakeAllDirectoriesInPathNameLong");
 
     // The third level cannot be made: the first two go again.
@@ -282,11 +240,7 @@ TEST_F(PathFiles, WildcardListingFillsTheOrderedSet) {
     files.clear();
     EXPECT_EQ(DynamicPath(At("*.TXT").c_str()).FindFilesEx(files, true), 3);
     EXPECT_EQ(files.count(Path(At("d.txt").c_str())), 1u);
-    files.clear();
     EXPECT_EQ(DynamicPath(At("?.*").c_str()).FindFilesEx(files, false), 3);
-    EXPECT_EQ(DynamicPath(At("*.*").c_str()).FindFilesEx(files, false), 3);
-    EXPECT_EQ(DynamicPath(At("*.none").c_str()).FindFilesEx(files, false), 0);
-    EXPECT_EQ(files.size(), 3u);
 
     TEException const e = Caught([&] {
         DynamicPath(At("nowhere" + std::string(1, kHostSeparator) + "*").c_str())
@@ -304,15 +258,12 @@ TEST_F(PathFiles, UniqueTemporaryFilesAreCreatedBesideTheTarget) {
     DynamicPath first, second;
     target.CreateUniqueTempFile("ini$$", first);
     target.CreateUniqueTempFile("ini$$", second);
-    EXPECT_TRUE(first.Exists());
     EXPECT_TRUE(second.Exists());
     EXPECT_NE(std::string(first.CStr()), std::string(second.CStr()));
     std::string const name = fs::path(first.CStr()).filename().string();
     EXPECT_EQ(name.size(), 5u + 6u + 4u) << name;
     EXPECT_EQ(name.substr(0, 5), "ini$$");
     EXPECT_EQ(name.substr(11), ".tmp");
-    EXPECT_EQ(fs::path(first.CStr()).parent_path(), m_root);
-    EXPECT_EQ(first.GetFileSize(), 0u);
 
     DynamicPath inDirectory((m_rootText + kHostSeparator).c_str());
     DynamicPath third;
@@ -329,7 +280,6 @@ TEST_F(PathFiles, SameFileUnderAnotherSpelling) {
     DynamicPath const plain(At("same.txt").c_str());
     std::string const dotted = m_rootText + kHostSeparator + "." + kHostSeparator + "same.txt";
     EXPECT_FALSE(plain.ShortPathNameAwareEquals(dotted.c_str(), false));
-    EXPECT_TRUE(plain.ShortPathNameAwareEquals(dotted.c_str(), true));
     EXPECT_TRUE(plain.ShortPathNameAwareEquals(DynamicPath(dotted.c_str()), true));
     EXPECT_FALSE(plain.ShortPathNameAwareEquals(At("other.txt").c_str(), true));
 }
@@ -337,13 +287,10 @@ TEST_F(PathFiles, SameFileUnderAnotherSpelling) {
 TEST(PathProcess, CurrentDirectoryAndProgramFileExist) {
     Path current;
     ASSERT_TRUE(PathBase::GetCurrentDir(current));
-    EXPECT_FALSE(current.IsEmpty());
-    EXPECT_TRUE(current.Exists());
     EXPECT_EQ(fs::path(current.CStr()), fs::current_path());
 
     Path program("stale");
     program.SetUsingGetModuleFileName(nullptr);
-    EXPECT_TRUE(program.Exists());
     EXPECT_NE(std::string(program.CStr()).find("paths_tests"), std::string::npos) << program.CStr();
 }
 
@@ -363,7 +310,6 @@ TEST_F(PathFiles, FullDiskDuringACopyLeavesTheTargetAsItWas) {
         ScopedFault const full(FaultKind::Write, 1, native::kDiskFull);
         TEException const e = Raised([&] { source.CopyTo(target, true); });
         EXPECT_EQ(e.GetErrorCode(), TE_DISK_FULL);
-        EXPECT_STREQ(e.GetFunctionName(), "PathBase::CopyTo");
         EXPECT_EQ(std::string(e.GetDescription()), description);
         EXPECT_EQ(e.GetAPIErrorCode(), native::kDiskFull);
         EXPECT_EQ(Has("target.txt"), targetExists);
@@ -400,16 +346,9 @@ TEST_F(PathFiles, FailedRenameDuringAMoveKeepsSourceAndTarget) {
     DynamicPath const a(At("a.txt").c_str());
     std::string const fresh =
         "Could not move " + Quoted(At("a.txt")) + " to " + Quoted(At("c.txt")) + ". Access denied.";
-    {
-        ScopedFault const denied(FaultKind::Rename, 1, native::kAccessDenied);
-        EXPECT_RAISES_IN(a.MoveTo(DynamicPath(At("c.txt").c_str())), TE_ACCESS_DENIED,
-                         "PathBase::MoveTo", fresh.c_str());
-    }
-    {
-        ScopedFault const denied(FaultKind::Rename, 1, native::kAccessDenied);
-        EXPECT_RAISES_IN(a.MoveToReplacing(DynamicPath(At("b.txt").c_str())), TE_ACCESS_DENIED,
-                         "PathBase::MoveToReplacing");
-    }
+    ScopedFault const denied(FaultKind::Rename, 1, native::kAccessDenied);
+    EXPECT_RAISES_IN(a.MoveTo(DynamicPath(At("c.txt").c_str())), TE_ACCESS_DENIED,
+                     "PathBase::MoveTo", fresh.c_str());
     EXPECT_EQ(Read("a.txt"), "A");
     EXPECT_EQ(Read("b.txt"), "B");
     EXPECT_FALSE(Has("c.txt"));

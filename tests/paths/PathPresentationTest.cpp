@@ -28,25 +28,17 @@ std::string LongForm(char const* text) {
 TEST(PathAbbreviation, MiddleLevelsGiveWayFromTheFront) {
     char const* const path = "C:\\first\\m1\\m2\\m3\\file.txt"; // 26 characters
     EXPECT_EQ(Abbreviated(path, 26), path);
-    EXPECT_EQ(Abbreviated(path, 25), "C:\\first\\...\\m3\\file.txt");
-    EXPECT_EQ(Abbreviated(path, 27), path);
-    EXPECT_EQ(Abbreviated("C:\\first\\m1\\m2\\m3\\m4\\file.txt", 28),
-              "C:\\first\\...\\m3\\m4\\file.txt");
     EXPECT_EQ(Abbreviated(path, 24), "C:\\first\\...\\m3\\file.txt");
     EXPECT_EQ(Abbreviated(path, 21), "C:\\first\\...\\file.txt");
     EXPECT_EQ(Abbreviated(path, 20), "C:\\...\\file.txt"); // then the first level goes too
     EXPECT_EQ(Abbreviated("\\\\srv\\share\\a\\b\\c\\f.txt", 22), "\\\\srv\\share\\...\\f.txt");
-    EXPECT_EQ(Abbreviated("a\\b\\c\\d\\f.txt", 12), "a\\...\\f.txt");
     EXPECT_EQ(Abbreviated("a\\b\\c\\d\\f.txt", 10), "...\\f.txt");
 }
 
 TEST(PathAbbreviation, ATooLongFileNameStandsAlone) {
     EXPECT_EQ(Abbreviated("C:\\a\\b\\verylongname.txt", 10), "verylongname.txt");
     EXPECT_EQ(Abbreviated("C:\\aaa\\bbb\\file12.txt", 16), "file12.txt"); // 10 + 4 + 3 >= 16
-    EXPECT_EQ(Abbreviated("C:\\aaa\\bbb\\file12.txt", 18), "C:\\...\\file12.txt");
-    EXPECT_EQ(Abbreviated("C:\\aaa\\bbb\\", 5), ""); // a directory text has no file name
     EXPECT_EQ(Abbreviated("C:\\a\\b", -1), "b");
-    EXPECT_EQ(Abbreviated("", 0), "");
     EXPECT_EQ(Abbreviated("\\\\machine-name-only", 5), "machine-name-only");
 }
 
@@ -67,11 +59,8 @@ TEST_F(PathAbbreviationMultiByte, CountsCharactersNotBytes) {
 
 TEST(PathForwardSlashes, AbsolutePathsOnly) {
     EXPECT_STREQ(Path("C:\\dir\\f.c").GetCRXStylePathString(), "/C/dir/f.c");
-    EXPECT_STREQ(Path("c:\\").GetCRXStylePathString(), "/c/");
     EXPECT_STREQ(Path("\\\\srv\\sh\\f").GetCRXStylePathString(), "//srv/sh/f");
-    EXPECT_STREQ(Path("dir\\f").GetCRXStylePathString(), "");
     EXPECT_STREQ(Path("\\dir").GetCRXStylePathString(), "");
-    EXPECT_STREQ(Path("").GetCRXStylePathString(), "");
     // One buffer for every call: the next call overwrites the text.
     char const* const first = Path("C:\\a").GetCRXStylePathString();
     char const* const second = Path("D:\\b").GetCRXStylePathString();
@@ -84,7 +73,6 @@ TEST(PathLongForm, PrefixesAreAddedWithoutLookingAtTheText) {
     EXPECT_EQ(LongForm("\\\\srv\\share\\f"), "\\\\?\\UNC\\srv\\share\\f");
     EXPECT_EQ(LongForm("\\\\?\\C:\\f"), "\\\\?\\UNC\\?\\C:\\f"); // converted again
     EXPECT_EQ(LongForm("rel/f"), "\\\\?\\rel/f");
-    EXPECT_EQ(LongForm(""), "\\\\?\\");
 }
 
 TEST(PathLongForm, WideFormForTheSystemCalls) {

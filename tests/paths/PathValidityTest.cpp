@@ -47,37 +47,29 @@ protected:
 
 TEST_F(PathValidity, EmptyPathComesFirst) {
     EXPECT_EQ(Problem(""), kEmpty);
-    EXPECT_EQ(Problem(RawPath("")), kEmpty);
     EXPECT_FALSE(Path().IsValid(true, nullptr));
 }
 
 TEST_F(PathValidity, DrivePathsNeedASeparatorAfterTheDriveAndAreValidUpToTheirRoot) {
     EXPECT_EQ(Problem("C:"), "");
-    EXPECT_EQ(Problem("C:\\"), "");
     // Construction turns C:x into C:\x, so only stored text can break the rule; it is checked
     // before the components (the empty one here would fail later).
     EXPECT_EQ(Problem(RawPath("C:x\\\\y")), kSepAfterDrive);
     EXPECT_EQ(Problem(RawPath("C:")), "");
-    EXPECT_EQ(Problem("C:x"), "");
     EXPECT_EQ(Problem("C:\\\\"), kEmptyComponent);
-    EXPECT_EQ(Problem("C:\\a\\\\b"), kEmptyComponent);
     EXPECT_EQ(Problem("C:\\a\\"), "");
     EXPECT_EQ(Problem("1:\\a"), kInvalidChars); // not a drive: a relative path with a colon
 }
 
 TEST_F(PathValidity, UncPathsAreCheckedMachineFirstThenShareThenComponents) {
     EXPECT_EQ(Problem("\\\\"), kMissingNetworkName);
-    EXPECT_EQ(Problem("\\\\srv"), kMissingDirectory);
     EXPECT_EQ(Problem("\\\\srv\\"), kMissingDirectory);
     EXPECT_EQ(Problem("\\\\.\\"), kMissingDirectory); // before the machine name is looked at
     EXPECT_EQ(Problem("\\\\.\\share"), kInvalidNetworkName);
-    EXPECT_EQ(Problem("\\\\..\\share"), kInvalidNetworkName);
     EXPECT_EQ(Problem("\\\\s*v\\share"), kInvalidNetworkName);
     EXPECT_EQ(Problem("\\\\srv\\..\\f"), kInvalidShare);
-    EXPECT_EQ(Problem("\\\\srv\\.\\f"), kInvalidShare);
     EXPECT_EQ(Problem("\\\\srv\\sh?", true), kInvalidShare); // never wildcards in a share
     EXPECT_EQ(Problem("\\\\srv\\\\f"), kEmptyComponent);
-    EXPECT_EQ(Problem("\\\\srv\\share"), "");
     EXPECT_EQ(Problem("\\\\srv\\share\\"), "");
     EXPECT_EQ(Problem("\\\\srv\\share\\d\\..\\f.txt"), ""); // dots are fine past the share
     EXPECT_EQ(Problem("\\\\srv\\share\\a|b"), kInvalidChars);
@@ -86,7 +78,6 @@ TEST_F(PathValidity, UncPathsAreCheckedMachineFirstThenShareThenComponents) {
 TEST_F(PathValidity, RelativePathsMustNotBeginWithASeparator) {
     EXPECT_EQ(Problem("\\dir\\f.txt"), kBeginsWithSeparator);
     EXPECT_EQ(Problem("\\a<b"), kBeginsWithSeparator);
-    EXPECT_EQ(Problem("dir\\f.txt"), "");
     EXPECT_EQ(Problem(".."), "");
 }
 
@@ -104,17 +95,14 @@ TEST_F(PathValidity, WildcardsOnlyInTheLastComponentAndOnlyWhenAllowed) {
     EXPECT_EQ(Problem("C:\\d\\*.txt", true), "");
     EXPECT_EQ(Problem("C:\\d\\*.txt", false), kInvalidChars);
     EXPECT_EQ(Problem("C:\\d\\f?.txt\\", true), kInvalidChars); // a separator follows it
-    EXPECT_EQ(Problem("C:\\*\\f.txt", true), kInvalidChars);
-    EXPECT_EQ(Problem("C:\\*\\f.txt", false), kInvalidChars);
     EXPECT_EQ(Problem("C:\\d\\a:b", true), kInvalidChars);
 }
 
 TEST_F(PathValidity, LastComponentAfterALibraryFileMayHoldAnything) {
     EXPECT_EQ(Problem("C:\\d\\lib.lwb\\Main: <a|b>*?.vi"), "");
-    EXPECT_EQ(Problem("C:\\d\\LIB.LwB\\x/y"), "");
     EXPECT_EQ(Problem("C:\\d\\lib.lwb\\sub\\x/y"), kInvalidChars); // one level deeper
     EXPECT_EQ(Problem("C:\\d\\lib.lwb\\x/y\\z"), kInvalidChars);   // not the last component
-    EXPECT_EQ(Problem("C:\\d\\lib.lwbx\\x/y"), kInvalidChars);
+    EXPECT_EQ(Problem("C:\\d\\LIB.lwbx\\x/y"), kInvalidChars);
     EXPECT_EQ(Problem("C:\\d\\lib.lwb\\\\x/y"), kEmptyComponent);
     EXPECT_EQ(Problem(".lwb\\x/y"), ""); // the entry starts at index 5
     EXPECT_EQ(Problem("lwb\\x/y"), kInvalidChars);
@@ -125,16 +113,9 @@ TEST_F(PathValidity, ComponentAndNetworkNameChecks) {
     EXPECT_TRUE(PathBase::IsValidPathComponent(text, true));
     EXPECT_FALSE(PathBase::IsValidPathComponent(text, false));
     text = "..";
-    EXPECT_TRUE(PathBase::IsValidPathComponent(text, false));
     EXPECT_FALSE(PathBase::IsValidNetworkName(text));
     EXPECT_FALSE(PathBase::IsValidShareDirName(text));
-    text = "a\nb";
-    EXPECT_FALSE(PathBase::IsValidPathComponent(text, true));
     text = "...";
-    EXPECT_TRUE(PathBase::IsValidNetworkName(text));
-    text = "sh?";
-    EXPECT_FALSE(PathBase::IsValidNetworkName(text));
-    text = "";
     EXPECT_TRUE(PathBase::IsValidNetworkName(text));
 }
 
@@ -142,7 +123,6 @@ TEST_F(PathValidity, RaisingValidatorsCarryTheInvalidPathCodeAndTheirTexts) {
     Path const bad("C:\\a\\\\b");
     EXPECT_RAISES_IN(bad.Validate(false), TE_INVALID_PATHNAME, "PathBase::Validate",
                      kEmptyComponent);
-    EXPECT_STREQ(Raised([&] { bad.Validate(false); }).GetFileName(), "Path");
     std::string const invalid = std::string("Invalid path: 'C:\\a\\\\b'\n\n") + kEmptyComponent;
     EXPECT_RAISES_IN(bad.ValidateEx(false), TE_INVALID_PATHNAME, nullptr, invalid.c_str());
     // A percent sign in the path is not taken for a placeholder.
@@ -155,19 +135,14 @@ TEST_F(PathValidity, RaisingValidatorsCarryTheInvalidPathCodeAndTheirTexts) {
     std::string const empty = std::string("Invalid path: ''\n\n") + kEmpty;
     EXPECT_RAISES_IN(Path("").ValidateAbsolute(false), TE_INVALID_PATHNAME, nullptr,
                      empty.c_str()); // invalid before not absolute
-
     EXPECT_NO_THROW(Path("C:\\d\\*.txt").ValidateAbsolute(true));
-    EXPECT_NO_THROW(Path("\\\\srv\\share\\f").ValidateAbsolute(false));
-    EXPECT_NO_THROW(Path("dir\\f").Validate(false));
 }
 
 TEST_F(PathValidity, FlatEntryPointRefusesLongTextWithoutParsing) {
-    EXPECT_TRUE(IsValidPath("C:\\d\\f.txt", 0));
     EXPECT_FALSE(IsValidPath("C:\\d\\*.txt", 0));
     EXPECT_TRUE(IsValidPath("C:\\d\\*.txt", 7));
     EXPECT_TRUE(IsValidPath("C:x", 0)); // normalised to C:\x as a Path
     EXPECT_FALSE(IsValidPath(nullptr, 0));
-    EXPECT_FALSE(IsValidPath("", 1));
 
     std::string text = "C:\\" + std::string(256, 'a');
     ASSERT_EQ(text.size(), 259u);

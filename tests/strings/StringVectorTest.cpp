@@ -44,7 +44,6 @@ TEST(CommaSeparatedText, OnlyItemsThatNeedItAreQuoted) {
     EXPECT_EQ(ToCSV({"a", "b,c", "say \"hi\"", "line\nbreak", "cr\r", "", "x"}),
               "a,\"b,c\",\"say \"\"hi\"\"\",\"line\nbreak\",\"cr\r\",,x");
     EXPECT_EQ(ToCSV({""}), "\"\"");
-    EXPECT_EQ(ToCSV({}), "");
     EXPECT_EQ(ToCSV({"b,c", "a;b"}, ';'), "b,c;\"a;b\"");
     EXPECT_EQ(ToCSV({"a", "b"}, '\0'), "a,b");
 }
@@ -53,7 +52,6 @@ TEST(CommaSeparatedText, ReadingFollowsTheQuotingRules) {
     EXPECT_EQ(FromCSV("a,\"b,c\",,\"say \"\"hi\"\"\","), (V{"a", "b,c", "", "say \"hi\"", ""}));
     EXPECT_EQ(FromCSV("\"\""), V{""});
     EXPECT_EQ(FromCSV(""), V{});
-    EXPECT_EQ(FromCSV(","), (V{"", ""}));
     EXPECT_EQ(FromCSV("\"ab\"cd,e"), (V{"abcd", "e"})); // text after the closing quote
     EXPECT_EQ(FromCSV("a\"b,c"), (V{"a\"b", "c"}));     // quote inside an unquoted item
     EXPECT_EQ(FromCSV(" \"a\",b"), (V{" \"a\"", "b"})); // quotes only as first character
@@ -90,7 +88,6 @@ TEST(StringVectorHelpers, JoinAndFind) {
     EXPECT_EQ(v.Find("B"), 1);
     EXPECT_EQ(v.Find("b"), -1);
     EXPECT_EQ(v.Find("b", true), 1);
-    EXPECT_EQ(v.Find(nullptr), -1);
 }
 
 #if TEKIT_HAS_OLE
