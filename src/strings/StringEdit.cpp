@@ -49,24 +49,32 @@ void String::GetSubstring(int start, int numChars, String& out) const {
     out.AssignUsingNumBytesInsteadOfNumChars(text + offset, bytes, false);
 }
 
-void String::InsertSubstring(char const* text, int charIndex) {
-    detail::StableText const insert(*this, text, -1);
+namespace {
+
+/// Inserts `insert` before character `charIndex` of `s`: the new byte size, or -1 when there
+/// is nothing to insert.
+int InsertBeforeChar(String& s, detail::StableText const& insert, int charIndex, bool mb) {
     if (insert.size() == 0)
-        return;
-    int const numBytes = GetNumBytes();
-    int const offset = detail::OffsetOfChar(detail::ReadPtr(*this), numBytes, charIndex,
-                                            m_isMultiByteSupportEnabled);
-    SetCachedSize(detail::InsertBytes(*this, numBytes, offset, insert.data(), insert.size()));
+        return -1;
+    int const numBytes = s.GetNumBytes();
+    int const offset = detail::OffsetOfChar(detail::ReadPtr(s), numBytes, charIndex, mb);
+    return detail::InsertBytes(s, numBytes, offset, insert.data(), insert.size());
+}
+
+} // namespace
+
+void String::InsertSubstring(char const* text, int charIndex) {
+    int const size = InsertBeforeChar(*this, detail::StableText(*this, text, -1), charIndex,
+                                      m_isMultiByteSupportEnabled);
+    if (size >= 0)
+        SetCachedSize(size);
 }
 
 void String::InsertSubstring(String const& text, int charIndex) {
     detail::StableText const insert(*this, detail::ReadPtr(text), text.GetNumBytes());
-    if (insert.size() == 0)
-        return;
-    int const numBytes = GetNumBytes();
-    int const offset = detail::OffsetOfChar(detail::ReadPtr(*this), numBytes, charIndex,
-                                            m_isMultiByteSupportEnabled);
-    SetCachedSize(detail::InsertBytes(*this, numBytes, offset, insert.data(), insert.size()));
+    int const size = InsertBeforeChar(*this, insert, charIndex, m_isMultiByteSupportEnabled);
+    if (size >= 0)
+        SetCachedSize(size);
 }
 
 void String::RemoveSubstring(int start, int numChars) {

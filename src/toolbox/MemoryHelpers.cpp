@@ -1,4 +1,7 @@
+// The toolbox's memory helpers: freeing its blocks, exchanging two blocks, rounding sizes.
 #include "tekit/toolbox/MemoryHelpers.h"
+
+#include "toolbox/SwapBytes.h"
 
 #include <climits>
 #include <cstdint>
@@ -19,18 +22,7 @@ extern "C" int TEKIT_STDCALL SwapBlock(void* a, void* b, int numBytes) {
     auto const n = static_cast<std::uintptr_t>(numBytes);
     if (x < y + n && y < x + n)
         return 0; // partly overlapping blocks have no meaningful exchange
-    auto* p = static_cast<unsigned char*>(a);
-    auto* q = static_cast<unsigned char*>(b);
-    unsigned char step[256];
-    for (std::size_t left = n; left > 0;) {
-        std::size_t const k = left < sizeof step ? left : sizeof step;
-        std::memcpy(step, p, k);
-        std::memcpy(p, q, k);
-        std::memcpy(q, step, k);
-        p += k;
-        q += k;
-        left -= k;
-    }
+    tekit::toolbox::SwapBytes(a, b, n);
     return 1;
 }
 

@@ -7,6 +7,7 @@
 
 #include "toolbox/BinarySearch.h"
 #include "toolbox/FlatGuard.h"
+#include "toolbox/SwapBytes.h"
 
 #include <cstddef>
 #include <cstdint>
@@ -43,18 +44,7 @@ struct AnyItems {
     std::size_t size;
     std::size_t Size() const { return size; }
     void Copy(void* to, void const* from) const { std::memcpy(to, from, size); }
-    void Swap(void* a, void* b) const {
-        auto* p = static_cast<unsigned char*>(a);
-        auto* q = static_cast<unsigned char*>(b);
-        unsigned char t[64];
-        for (std::size_t left = size; left > 0;) {
-            std::size_t const n = left < sizeof t ? left : sizeof t;
-            std::memcpy(t, p, n);
-            std::memcpy(p, q, n);
-            std::memcpy(q, t, n);
-            p += n, q += n, left -= n;
-        }
-    }
+    void Swap(void* a, void* b) const { SwapBytes(a, b, size); }
 };
 
 /// One spare item: on the stack when small, else on the heap.
