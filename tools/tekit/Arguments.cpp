@@ -32,7 +32,7 @@ void TakeOption(std::vector<std::string> const& words, size_t& i,
         name == "--json" ? void(call.json = true) : void(call.options["--help"] = "");
         return;
     }
-    OptionSpec const* spec = word.rfind("--", 0) == 0 ? FindOption(options, name) : nullptr;
+    OptionSpec const* spec = FindOption(options, name); // "--name", or "-x" where one is defined
     if (!spec)
         throw UsageError("unknown option " + Quote(Shown(word)), command);
     if (!spec->valueName) {

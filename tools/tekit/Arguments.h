@@ -28,9 +28,9 @@ private:
 /// are never part of the word.
 std::string Quote(std::string const& text);
 
-/// Splits `words` into options (--name, --name=value, --name value) and arguments. "--" ends
-/// the options; "-" and negative numbers ("-17208") are arguments. --json sets
-/// Invocation::json and --help (-h) appears as option "--help".
+/// Splits `words` into options (--name, --name=value, --name value, and -x where a command
+/// defines one) and arguments. "--" ends the options; "-" and negative numbers ("-17208") are
+/// arguments. --json sets Invocation::json and --help (-h) appears as option "--help".
 Invocation ParseArguments(std::vector<std::string> const& words,
                           std::vector<OptionSpec> const& options, std::string const& command);
 

@@ -54,6 +54,9 @@ struct Command {
 std::vector<Command> const& DemoCommands();
 std::vector<Command> const& ErrorCommands();
 std::vector<Command> const& PathCommands();
+std::vector<Command> const& RangeCommands();
+std::vector<Command> const& VersionCommands();
+std::vector<Command> const& GrepCommands();
 
 /// A word that gathers commands ("path" for "path check", ...): its own help.
 struct CommandGroup {
@@ -62,5 +65,6 @@ struct CommandGroup {
     char const* details;
 };
 CommandGroup const& PathGroup();
+CommandGroup const& VersionGroup();
 
 } // namespace tekit::tool

@@ -50,7 +50,8 @@ Exit status:
 std::vector<Command> const& AllCommands() {
     static std::vector<Command> const commands = [] {
         std::vector<Command> all;
-        for (auto const* list : {&DemoCommands(), &ErrorCommands(), &PathCommands()})
+        for (auto const* list : {&DemoCommands(), &ErrorCommands(), &PathCommands(),
+                                 &RangeCommands(), &VersionCommands(), &GrepCommands()})
             all.insert(all.end(), list->begin(), list->end());
         return all;
     }();
@@ -58,7 +59,7 @@ std::vector<Command> const& AllCommands() {
 }
 
 std::vector<CommandGroup const*> const& AllGroups() {
-    static std::vector<CommandGroup const*> const groups{&PathGroup()};
+    static std::vector<CommandGroup const*> const groups{&PathGroup(), &VersionGroup()};
     return groups;
 }
 
