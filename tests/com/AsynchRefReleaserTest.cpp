@@ -1,0 +1,199 @@
+// AsynchRefReleaser: the opt-in, release on the worker thread, flushing, clean-up with work
+// still queued, and many threads handing holders over at once.
+#include "CountedObject.h"
+
+#include "tekit/com/AsynchRefReleaser.h"
+#include "tekit/com/GlobalInterfacePointer.h"
+#include "tekit/sync/PerformanceOptions.h"
+
+#include "platform/Thread.h"
+
+#include <gtest/gtest.h>
+
+#include <atomic>
+#include <chrono>
+#include <deque>
+#include <memory>
+#include <thread>
+#include <vector>
+
+namespace tekit {
+namespace {
+
+using testing::ApartmentScope;
+using testing::CountedObject;
+using testing::kTestInterfaceId;
+using Holder = std::shared_ptr<OVGlobalInterfacePointer>;
+
+Holder Hold(CountedObject& object) {
+    return std::make_shared<OVGlobalInterfacePointer>(&object, kTestInterfaceId,
+                                                      DynamicString("ITest"), false, false, false);
+}
+
+/// Each test starts without a releaser and with asynchronous release as it asks. The options
+/// are set only while the releaser's thread is not running, as the library requires.
+class AsynchRefReleaserTest : public ::testing::Test {
+protected:
+    void SetUp() override { AsynchRefReleaser::Cleanup(); }
+    void TearDown() override {
+        AsynchRefReleaser::Cleanup();
+        gPerformanceOptions = m_savedOptions;
+    }
+    static void EnableAsynchronousRelease(bool on) {
+        if (on)
+            gPerformanceOptions |= kPerformanceOptionAsynchronousRelease;
+        else
+            gPerformanceOptions &= ~kPerformanceOptionAsynchronousRelease;
+    }
+
+    ApartmentScope m_apartment;
+    std::int32_t const m_savedOptions = gPerformanceOptions;
+    std::uint32_t const m_self = platform::CurrentThreadId();
+};
+
+TEST_F(AsynchRefReleaserTest, WithoutAReleaserFlushReturnsAtOnceAndReleaseIsImmediate) {
+    EnableAsynchronousRelease(true);
+    EXPECT_EQ(AsynchRefReleaser::FlushAllReferencesNow(INFINITE), 0u);
+    AsynchRefReleaser::FlushAllReferencesNowInCallingThread(); // nothing to do, no failure
+
+    Holder none;
+    AsynchRefReleaser::Release(none); // ignored
+    EXPECT_EQ(none, nullptr);
+
+    CountedObject object;
+    Holder holder = Hold(object);
+    AsynchRefReleaser::Release(holder);
+    EXPECT_EQ(holder, nullptr);
+    EXPECT_EQ(object.Count(), 1);
+    EXPECT_EQ(object.LastReleasingThread(), m_self);
+}
+
+TEST_F(AsynchRefReleaserTest, ReleaseHappensOnTheWorkerOnlyWhenOptedIn) {
+    for (bool const optIn : {false, true}) {
+        SCOPED_TRACE(optIn ? "bit 32 set" : "bit 32 clear");
+        AsynchRefReleaser::Cleanup(); // the options change only while no thread reads them
+        EnableAsynchronousRelease(optIn);
+        AsynchRefReleaser::Initialize();
+        AsynchRefReleaser::Initialize(); // a second call keeps the running releaser
+        CountedObject object;
+        Holder holder = Hold(object);
+        AsynchRefReleaser::Release(holder);
+        EXPECT_EQ(holder, nullptr);
+        EXPECT_EQ(AsynchRefReleaser::FlushAllReferencesNow(INFINITE), WAIT_OBJECT_0);
+        EXPECT_EQ(object.Count(), 1);
+        EXPECT_EQ(object.LastReleasingThread() == m_self, !optIn);
+    }
+}
+
+TEST_F(AsynchRefReleaserTest, FlushWaitsForAReleaseInProgressAndTimesOutWhileItLasts) {
+    EnableAsynchronousRelease(true);
+    AsynchRefReleaser::Initialize();
+    std::atomic<bool> gate{false}, entered{false};
+    CountedObject object;
+    Holder holder = Hold(object);
+    object.BlockReleasesOn(&gate, &entered);
+    AsynchRefReleaser::Release(holder);
+    while (!entered)
+        std::this_thread::yield();
+    EXPECT_EQ(AsynchRefReleaser::FlushAllReferencesNow(30), WAIT_TIMEOUT);
+    std::thread opener([&] {
+        std::this_thread::sleep_for(std::chrono::milliseconds(50));
+        gate = true;
+    });
+    EXPECT_EQ(AsynchRefReleaser::FlushAllReferencesNow(INFINITE), WAIT_OBJECT_0);
+    EXPECT_EQ(object.Count(), 1);
+    opener.join();
+}
+
+/// Holds the worker inside the first object's release while more holders queue behind it.
+struct StuckWorker {
+    std::atomic<bool> gate{false}, entered{false};
+    CountedObject first;
+    std::deque<CountedObject> queued{8};
+
+    void Start() {
+        Holder holder = Hold(first);
+        first.BlockReleasesOn(&gate, &entered);
+        AsynchRefReleaser::Release(holder);
+        while (!entered)
+            std::this_thread::yield();
+        for (CountedObject& object : queued) {
+            Holder more = Hold(object);
+            AsynchRefReleaser::Release(more);
+        }
+    }
+    std::thread OpenGateLater() {
+        return std::thread([this] {
+            std::this_thread::sleep_for(std::chrono::milliseconds(50));
+            gate = true;
+        });
+    }
+};
+
+TEST_F(AsynchRefReleaserTest, CleanupReleasesWhatIsStillQueued) {
+    EnableAsynchronousRelease(true);
+    AsynchRefReleaser::Initialize();
+    StuckWorker worker;
+    worker.Start();
+    std::thread opener = worker.OpenGateLater();
+    AsynchRefReleaser::Cleanup();
+    opener.join();
+    EXPECT_EQ(worker.first.Count(), 1);
+    for (CountedObject const& object : worker.queued) {
+        EXPECT_EQ(object.Count(), 1);
+        EXPECT_NE(object.LastReleasingThread(), m_self);
+    }
+    EXPECT_EQ(AsynchRefReleaser::FlushAllReferencesNow(INFINITE), 0u); // gone
+}
+
+TEST_F(AsynchRefReleaserTest, FlushInCallingThreadReleasesTheQueueThereAndAwaitsTheWorker) {
+    EnableAsynchronousRelease(true);
+    AsynchRefReleaser::Initialize();
+    StuckWorker worker;
+    worker.Start();
+    worker.queued.back().OpenOnRelease(&worker.gate); // the calling thread frees the worker
+    AsynchRefReleaser::FlushAllReferencesNowInCallingThread();
+    // Returns only after the worker's own release has finished as well.
+    EXPECT_EQ(worker.first.Count(), 1);
+    for (CountedObject const& object : worker.queued) {
+        EXPECT_EQ(object.Count(), 1);
+        EXPECT_EQ(object.LastReleasingThread(), m_self);
+    }
+}
+
+TEST_F(AsynchRefReleaserTest,
+       ManyThreadsHandOverThousandsOfHoldersAndNothingLeaksOrIsReleasedTwice) {
+    constexpr int kThreads = 4;
+    constexpr int kPerThread = 2500;
+    EnableAsynchronousRelease(true);
+    AsynchRefReleaser::Initialize();
+    std::deque<CountedObject> objects(kThreads * kPerThread);
+    std::vector<std::thread> threads;
+    for (int t = 0; t < kThreads; ++t)
+        threads.emplace_back([&objects, t] {
+            ApartmentScope apartment;
+            for (int i = t * kPerThread; i < (t + 1) * kPerThread; ++i) {
+                Holder holder = Hold(objects[static_cast<std::size_t>(i)]);
+                bool done = false;
+                auto* local = static_cast<IUnknown*>(holder->GetLocalInterface(true, &done));
+                if (done)
+                    local->Release();
+                AsynchRefReleaser::Release(holder);
+            }
+        });
+    for (std::thread& thread : threads)
+        thread.join();
+    ASSERT_EQ(AsynchRefReleaser::FlushAllReferencesNow(INFINITE), WAIT_OBJECT_0);
+    int leaked = 0, overReleased = 0;
+    for (CountedObject& object : objects) {
+        leaked += object.Count() != 1;
+        overReleased += object.OverReleased();
+        object.Release(); // the creator's reference: now every count is 0
+        leaked += object.Count() != 0;
+    }
+    EXPECT_EQ(leaked, 0);
+    EXPECT_EQ(overReleased, 0);
+}
+
+} // namespace
+} // namespace tekit

@@ -1,0 +1,232 @@
+// The UI-aware locks and waits as every thread that owns no frame window sees them: exclusion,
+// recursion, one wake per hand-over, one wait event per lock, and the wait results and times.
+#include "sync/UIThreads.h"
+
+#include "tekit/sync/LWAwareCriticalSection.h"
+#include "tekit/sync/MessageLoopWaits.h"
+
+#include "platform/Event.h"
+
+#include <gtest/gtest.h>
+
+#include <atomic>
+#include <chrono>
+#include <functional>
+#include <thread>
+#include <vector>
+
+namespace tekit {
+namespace {
+
+using Clock = std::chrono::steady_clock;
+
+long MillisecondsSince(Clock::time_point start) {
+    return static_cast<long>(
+        std::chrono::duration_cast<std::chrono::milliseconds>(Clock::now() - start).count());
+}
+
+/// An event of the library's own for the tests' waits.
+class TestEvent {
+public:
+    explicit TestEvent(bool signalled) {
+        EXPECT_FALSE(platform::CreateEventObject(true, signalled, m_handle));
+    }
+    ~TestEvent() { platform::CloseWaitable(m_handle); }
+    TestEvent(TestEvent const&) = delete;
+    TestEvent& operator=(TestEvent const&) = delete;
+    HANDLE Get() const { return m_handle; }
+    void Set() { platform::SetEventObject(m_handle); }
+
+private:
+    platform::WaitableHandle m_handle = nullptr;
+};
+
+// ---- LWAwareCriticalSectionImplementation -------------------------------------------------
+
+TEST(LWAwareCriticalSectionImplementation, RecursiveOwnerNeverTouchesTheEvent) {
+    LWAwareCriticalSectionImplementation lock;
+    std::uint32_t const wakes = detail::LockWakeSignals();
+    std::uint32_t const events = detail::LockWaitEventsCreated();
+    for (int i = 0; i < 3; ++i)
+        ASSERT_TRUE(i == 1 ? lock.TryLock(kExclusiveAccess, 0) : lock.Lock(kExclusiveAccess, 0));
+    EXPECT_EQ(lock.GetThreadId(), detail::CurrentLockThreadId());
+    bool otherTook = true;
+    std::thread([&] { otherTook = lock.TryLock(kExclusiveAccess, 0); }).join();
+    EXPECT_FALSE(otherTook);
+    for (int i = 0; i < 3; ++i)
+        lock.Unlock(kExclusiveAccess);
+    EXPECT_EQ(lock.GetThreadId(), 0u);
+    EXPECT_EQ(detail::LockWakeSignals(), wakes);
+    EXPECT_EQ(detail::LockWaitEventsCreated(), events);
+}
+
+TEST(LWAwareCriticalSectionImplementation, EachHandOverToAWaiterSignalsOnce) {
+    LWAwareCriticalSectionImplementation lock;
+    lock.Lock(kExclusiveAccess, 0);
+    std::uint32_t const wakes = detail::LockWakeSignals();
+    std::atomic<bool> waiting{false}, acquired{false};
+    std::thread waiter([&] {
+        waiting = true;
+        lock.Lock(kExclusiveAccess, 0);
+        acquired = true;
+        lock.Lock(kExclusiveAccess, 0); // recursion on the new owner: no signal either
+        lock.Unlock(kExclusiveAccess);
+        lock.Unlock(kExclusiveAccess);
+    });
+    while (!waiting)
+        std::this_thread::yield();
+    std::this_thread::sleep_for(std::chrono::milliseconds(50));
+    EXPECT_FALSE(acquired);
+    lock.Unlock(kExclusiveAccess);
+    waiter.join();
+    EXPECT_TRUE(acquired);
+    EXPECT_EQ(detail::LockWakeSignals() - wakes, 1u);
+}
+
+TEST(LWAwareCriticalSectionImplementation, ContendingThreadsExcludeEachOtherAndShareOneEvent) {
+    constexpr int kThreads = 4;
+    constexpr int kRounds = 2000;
+    LWAwareCriticalSectionImplementation lock;
+    std::uint32_t const events = detail::LockWaitEventsCreated();
+    long counter = 0; // plain: only the lock protects it
+    std::atomic<int> inside{0}, overlaps{0};
+    std::vector<std::thread> threads;
+    for (int t = 0; t < kThreads; ++t)
+        threads.emplace_back([&] {
+            for (int i = 0; i < kRounds; ++i) {
+                lock.Lock(kExclusiveAccess, 0);
+                overlaps += inside.fetch_add(1) != 0;
+                ++counter;
+                inside.fetch_sub(1);
+                lock.Unlock(kExclusiveAccess);
+            }
+        });
+    for (std::thread& thread : threads)
+        thread.join();
+    EXPECT_EQ(counter, long{kThreads} * kRounds);
+    EXPECT_EQ(overlaps, 0);
+    EXPECT_LE(detail::LockWaitEventsCreated() - events, 1u);
+    HANDLE const event = lock.GetWaitForLockEvent();
+    EXPECT_EQ(lock.GetWaitForLockEvent(), event);
+    EXPECT_EQ(detail::LockWaitEventsCreated() - events, 1u);
+}
+
+TEST(LWAwareCriticalSectionImplementation, ThreadsAskingForTheWaitEventAtOnceCreateOne) {
+    LWAwareCriticalSectionImplementation lock;
+    std::uint32_t const events = detail::LockWaitEventsCreated();
+    std::atomic<bool> go{false};
+    HANDLE seen[8] = {};
+    std::vector<std::thread> threads;
+    for (HANDLE& handle : seen)
+        threads.emplace_back([&] {
+            while (!go)
+                std::this_thread::yield();
+            handle = lock.GetWaitForLockEvent();
+        });
+    go = true;
+    for (std::thread& thread : threads)
+        thread.join();
+    for (HANDLE const handle : seen)
+        EXPECT_EQ(handle, seen[0]);
+    EXPECT_NE(seen[0], nullptr);
+    EXPECT_EQ(detail::LockWaitEventsCreated() - events, 1u);
+}
+
+// ---- LWAwareCriticalSection ----------------------------------------------------------------
+
+TEST(LWAwareCriticalSection, ExcludesWritersAndRefusesARepeatedSharedRequest) {
+    LWAwareCriticalSection lock;
+    ASSERT_TRUE(lock.Lock(kSharedAccess, 0));
+    EXPECT_FALSE(lock.Lock(kSharedAccess, 0)); // refused at once, not a deadlock
+    lock.Unlock(kSharedAccess);
+
+    long counter = 0;
+    std::vector<std::thread> threads;
+    for (int t = 0; t < 4; ++t)
+        threads.emplace_back([&] {
+            for (int i = 0; i < 2000; ++i) {
+                ASSERT_TRUE(lock.Lock(kExclusiveAccess, 0));
+                ++counter;
+                lock.Unlock(kExclusiveAccess);
+            }
+        });
+    for (std::thread& thread : threads)
+        thread.join();
+    EXPECT_EQ(counter, 8000);
+}
+
+// ---- UI-thread detection without windows ---------------------------------------------------
+
+TEST(UIThreadDetection, ThreadWithoutFrameWindowsIsNeverAUIThread) {
+    LWAwareCriticalSectionImplementation::CleanupLWUIThreadDetectionHooks();
+    EXPECT_FALSE(LWAwareCriticalSectionImplementation::CurrentThreadIsLWUIThread());
+    LWAwareCriticalSectionImplementation::InitializeLWUIThreadDetectionHooks();
+    LWAwareCriticalSectionImplementation::InitializeLWUIThreadDetectionHooks(); // idempotent
+    EXPECT_FALSE(LWAwareCriticalSectionImplementation::CurrentThreadIsLWUIThread());
+    EXPECT_FALSE(LWAwareCriticalSectionImplementation::CurrentThreadIsLWUIThread());
+    LWAwareCriticalSectionImplementation::CleanupLWUIThreadDetectionHooks();
+    EXPECT_FALSE(LWAwareCriticalSectionImplementation::CurrentThreadIsLWUIThread());
+}
+
+TEST(UIThreadDetection, CaseFoldingIsTheCLocalesOnly) {
+    EXPECT_TRUE(detail::EqualIgnoringCase("lwFRAME", "LWFrame"));
+    EXPECT_FALSE(detail::EqualIgnoringCase("LWFrame2", "LWFrame"));
+    EXPECT_FALSE(detail::EqualIgnoringCase("LWFram", "LWFrame"));
+    EXPECT_FALSE(detail::EqualIgnoringCase("LWFr\xC4me", "LWFr\xE4me")); // no Latin-1 folding
+}
+
+// ---- Waits ---------------------------------------------------------------------------------
+
+struct WaitCase {
+    char const* name;
+    std::function<DWORD(HANDLE, unsigned long)> wait;
+};
+
+std::vector<WaitCase> const kWaits = {
+    {"LWUISafe", [](HANDLE h, unsigned long t) { return TEWaitForSingleObject_LWUISafe(h, t); }},
+    {"Limited", [](HANDLE h, unsigned long t) { return TEWaitInLimitedMessageLoop(h, t); }},
+    {"MessageLoop", [](HANDLE h, unsigned long t) { return TEWaitInMessageLoop(h, t, 5); }},
+};
+
+TEST(MessageLoopWaits, SignalledHandleEndsEveryWaitAtOnce) {
+    TestEvent event(true);
+    for (WaitCase const& c : kWaits) {
+        auto const start = Clock::now();
+        EXPECT_EQ(c.wait(event.Get(), INFINITE), WAIT_OBJECT_0) << c.name;
+        EXPECT_LT(MillisecondsSince(start), 1000) << c.name;
+    }
+}
+
+TEST(MessageLoopWaits, UnsignalledHandleTimesOutNoSoonerThanAsked) {
+    TestEvent event(false);
+    for (WaitCase const& c : kWaits) {
+        auto const start = Clock::now();
+        EXPECT_EQ(c.wait(event.Get(), 30), WAIT_TIMEOUT) << c.name;
+        EXPECT_GE(MillisecondsSince(start), 29) << c.name;
+    }
+    auto const start = Clock::now();
+    EXPECT_EQ(TEWaitInMessageLoop(event.Get(), 0, 20), WAIT_TIMEOUT); // after one poll
+    EXPECT_GE(MillisecondsSince(start), 19);
+}
+
+TEST(MessageLoopWaits, HandleSetByAnotherThreadEndsAnUnlimitedWait) {
+    for (WaitCase const& c : kWaits) {
+        TestEvent event(false);
+        std::thread setter([&] {
+            std::this_thread::sleep_for(std::chrono::milliseconds(20));
+            event.Set();
+        });
+        EXPECT_EQ(c.wait(event.Get(), INFINITE), WAIT_OBJECT_0) << c.name;
+        setter.join();
+    }
+}
+
+TEST(MessageLoopWaits, SleepLastsLongerThanItsDuration) {
+    auto const start = Clock::now();
+    TESleepInMessageLoop(25, 5);
+    EXPECT_GE(MillisecondsSince(start), 25);
+    TEProcessMessagesForLoomwireIfNeeded(); // no frames, nothing to do
+}
+
+} // namespace
+} // namespace tekit

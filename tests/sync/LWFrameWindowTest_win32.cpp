@@ -1,0 +1,228 @@
+// UI threads with real windows: the hook counts frame windows as they come and go, and a UI
+// thread that waits for a lock or a handle keeps serving its frames (a non-UI thread does not).
+// Windows only; under Wine these run on an Xvfb display.
+#if defined(_WIN32)
+
+#include "tekit/sync/LWAwareCriticalSection.h"
+#include "tekit/sync/MessageLoopWaits.h"
+
+#include <gtest/gtest.h>
+
+#include <atomic>
+#include <chrono>
+#include <functional>
+#include <thread>
+
+namespace tekit {
+namespace {
+
+using Detection = LWAwareCriticalSectionImplementation;
+
+constexpr char kFrameClass[] = "LWFrame";
+constexpr char kFrameClassOtherCase[] = "lwframe"; // the same class: class names ignore case
+constexpr char kPlainClass[] = "TekitPlainWindow";
+
+/// The messages a test posts, one bit each as the window procedure records them.
+struct Probe {
+    UINT message;
+    unsigned bit;
+};
+constexpr Probe kClipboard{0x308, 1};  // WM_DRAWCLIPBOARD, in the clipboard range
+constexpr Probe kUser{WM_USER + 7, 2}; // the application range
+constexpr Probe kTimer{WM_TIMER, 4};
+constexpr Probe kApp{WM_APP + 1, 8}; // outside every range of the frame pump
+constexpr Probe kProbes[] = {kClipboard, kUser, kTimer, kApp};
+
+LRESULT CALLBACK RecordingProcedure(HWND window, UINT message, WPARAM w, LPARAM l) {
+    auto* seen =
+        reinterpret_cast<std::atomic<unsigned>*>(::GetWindowLongPtrA(window, GWLP_USERDATA));
+    for (Probe const& probe : kProbes)
+        if (seen != nullptr && message == probe.message) {
+            seen->fetch_or(probe.bit);
+            return 0;
+        }
+    return ::DefWindowProcA(window, message, w, l);
+}
+
+void RegisterClasses() {
+    static bool const registered = [] {
+        for (char const* name : {kFrameClass, kPlainClass}) {
+            WNDCLASSA c{};
+            c.lpfnWndProc = RecordingProcedure;
+            c.hInstance = ::GetModuleHandleA(nullptr);
+            c.lpszClassName = name;
+            ::RegisterClassA(&c);
+        }
+        return true;
+    }();
+    (void)registered;
+}
+
+HWND CreateRecordedWindow(char const* className, std::atomic<unsigned>* seen) {
+    RegisterClasses();
+    HWND const window = ::CreateWindowExA(0, className, "", WS_OVERLAPPEDWINDOW, 0, 0, 100, 100,
+                                          nullptr, nullptr, ::GetModuleHandleA(nullptr), nullptr);
+    if (window != nullptr)
+        ::SetWindowLongPtrA(window, GWLP_USERDATA, reinterpret_cast<LONG_PTR>(seen));
+    return window;
+}
+
+void PostProbes(HWND window) {
+    for (Probe const& probe : kProbes)
+        ::PostMessageA(window, probe.message, 1, 0);
+}
+
+bool WaitUntil(std::function<bool()> const& done, int milliseconds) {
+    auto const until = std::chrono::steady_clock::now() + std::chrono::milliseconds(milliseconds);
+    while (!done()) {
+        if (std::chrono::steady_clock::now() > until)
+            return false;
+        std::this_thread::sleep_for(std::chrono::milliseconds(2));
+    }
+    return true;
+}
+
+class FrameWindowTest : public ::testing::Test {
+protected:
+    void SetUp() override { Detection::InitializeLWUIThreadDetectionHooks(); }
+    void TearDown() override { Detection::CleanupLWUIThreadDetectionHooks(); }
+};
+
+/// Wine reports the creation of windows to event hooks but not their destruction.
+bool RunningUnderWine() {
+    HMODULE const ntdll = ::GetModuleHandleA("ntdll.dll");
+    return ntdll != nullptr && ::GetProcAddress(ntdll, "wine_get_version") != nullptr;
+}
+
+TEST_F(FrameWindowTest, HookFollowsFrameWindowsAsTheyAreCreatedAndDestroyed) {
+    bool const destructionReported = !RunningUnderWine();
+    std::thread([destructionReported] {
+        EXPECT_FALSE(Detection::CurrentThreadIsLWUIThread()); // examined now: no frames
+        std::atomic<unsigned> seen{0};
+        HWND const plain = CreateRecordedWindow(kPlainClass, &seen);
+        EXPECT_FALSE(Detection::CurrentThreadIsLWUIThread());
+        HWND const first = CreateRecordedWindow(kFrameClass, &seen);
+        HWND const second = CreateRecordedWindow(kFrameClassOtherCase, &seen);
+        ASSERT_TRUE(first && second && plain);
+        EXPECT_TRUE(Detection::IsLWFrameWindow(first));
+        EXPECT_FALSE(Detection::IsLWFrameWindow(plain));
+        EXPECT_TRUE(Detection::CurrentThreadIsLWUIThread()); // counted by the hook
+        ::DestroyWindow(first);
+        EXPECT_TRUE(Detection::CurrentThreadIsLWUIThread()); // one frame is left
+        ::DestroyWindow(second);
+        if (destructionReported) {
+            EXPECT_FALSE(Detection::CurrentThreadIsLWUIThread());
+        }
+        ::DestroyWindow(plain);
+    }).join();
+    if (!destructionReported) {
+        GTEST_SKIP() << "Wine sends no EVENT_OBJECT_DESTROY: the count after the last frame is "
+                        "destroyed is checked on Windows only";
+    }
+}
+
+TEST_F(FrameWindowTest, ThreadIsExaminedByItsWindowsOnlyWhileTheHooksAreInstalled) {
+    std::thread([] {
+        std::atomic<unsigned> seen{0};
+        HWND const frame = CreateRecordedWindow(kFrameClass, &seen);
+        ASSERT_NE(frame, nullptr);
+        EXPECT_TRUE(Detection::CurrentThreadIsLWUIThread()); // first examination enumerates
+        Detection::CleanupLWUIThreadDetectionHooks();
+        EXPECT_FALSE(Detection::CurrentThreadIsLWUIThread());
+        Detection::InitializeLWUIThreadDetectionHooks();
+        EXPECT_TRUE(Detection::CurrentThreadIsLWUIThread()); // a fresh slot: examined again
+        ::DestroyWindow(frame);
+    }).join();
+}
+
+/// How a window thread waits while the main thread holds what it waits for.
+struct WaitKind {
+    char const* name;
+    /// Bits of the probes that the wait must dispatch on a UI thread and on a non-UI thread.
+    unsigned dispatchedOnUIThread;
+    unsigned dispatchedOtherwise;
+};
+
+constexpr unsigned kFrameBits = kClipboard.bit | kUser.bit | kTimer.bit;
+constexpr WaitKind kWaitKinds[] = {
+    {"reader-writer lock", kFrameBits, 0},
+    {"event-based lock", kFrameBits, 0},
+    {"LWUISafe wait", kFrameBits, 0},
+    {"limited message loop", kFrameBits, kClipboard.bit}, // clipboard for every window
+    {"message loop", kFrameBits | kApp.bit, kFrameBits | kApp.bit},
+};
+
+/// What the main thread holds and the window thread waits for.
+struct Blocker {
+    LWAwareCriticalSection rwLock;
+    LWAwareCriticalSectionImplementation eventLock;
+    HANDLE event = ::CreateEventA(nullptr, TRUE, FALSE, nullptr);
+
+    Blocker() {
+        rwLock.Lock(kExclusiveAccess, 0);
+        eventLock.Lock(kExclusiveAccess, 0);
+    }
+    ~Blocker() { ::CloseHandle(event); }
+    void Wait(int kind) {
+        switch (kind) {
+        case 0:
+            rwLock.Lock(kExclusiveAccess, 0);
+            rwLock.Unlock(kExclusiveAccess);
+            break;
+        case 1:
+            eventLock.Lock(kExclusiveAccess, 0);
+            eventLock.Unlock(kExclusiveAccess);
+            break;
+        case 2:
+            EXPECT_EQ(TEWaitForSingleObject_LWUISafe(event, INFINITE), WAIT_OBJECT_0);
+            break;
+        case 3:
+            EXPECT_EQ(TEWaitInLimitedMessageLoop(event, INFINITE), WAIT_OBJECT_0);
+            break;
+        default:
+            EXPECT_EQ(TEWaitInMessageLoop(event, INFINITE, 5), WAIT_OBJECT_0);
+            break;
+        }
+    }
+    void Release() {
+        rwLock.Unlock(kExclusiveAccess);
+        eventLock.Unlock(kExclusiveAccess);
+        ::SetEvent(event);
+    }
+};
+
+TEST_F(FrameWindowTest, WaitingUIThreadServesItsFramesAndOtherThreadsDoNot) {
+    for (int kind = 0; kind < 5; ++kind) {
+        WaitKind const& k = kWaitKinds[kind];
+        for (bool const uiThread : {true, false}) {
+            SCOPED_TRACE(std::string(k.name) + (uiThread ? " on a UI thread" : " elsewhere"));
+            unsigned const expected = uiThread ? k.dispatchedOnUIThread : k.dispatchedOtherwise;
+            Blocker blocker;
+            std::atomic<unsigned> seen{0};
+            std::atomic<bool> waiting{false};
+            std::thread windowThread([&] {
+                HWND const window =
+                    CreateRecordedWindow(uiThread ? kFrameClass : kPlainClass, &seen);
+                ASSERT_NE(window, nullptr);
+                PostProbes(window);
+                waiting = true;
+                blocker.Wait(kind);
+                ::DestroyWindow(window);
+            });
+            ASSERT_TRUE(WaitUntil([&] { return waiting.load(); }, 5000));
+            // Served while the wait lasts: the main thread sees it before it lets go.
+            bool const served = WaitUntil([&] { return (seen & expected) == expected; }, 5000);
+            std::this_thread::sleep_for(std::chrono::milliseconds(100)); // time for strays
+            unsigned const during = seen.load();
+            blocker.Release();
+            windowThread.join();
+            EXPECT_TRUE(served) << "dispatched: " << during;
+            EXPECT_EQ(during, expected);
+        }
+    }
+}
+
+} // namespace
+} // namespace tekit
+
+#endif
