@@ -2,7 +2,7 @@
 #include "tekit/paths/PathBase.h"
 
 #include "paths/PathRules.h"
-#include "strings/MultiByte.h"
+#include "strings/MultiByteChars.h"
 #include "tekit/paths/DynamicPath.h"
 #include "tekit/paths/Path.h"
 

@@ -2,7 +2,7 @@
 // on characters, never on half a character.
 #include "paths/PathChars.h"
 
-#include "strings/MultiByte.h"
+#include "strings/MultiByteChars.h"
 
 #include <algorithm>
 

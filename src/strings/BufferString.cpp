@@ -1,7 +1,7 @@
 // BufferString: a string over a caller's fixed buffer, truncating at its capacity.
 #include "tekit/strings/BufferString.h"
 
-#include "strings/MultiByte.h"
+#include "strings/MultiByteChars.h"
 
 #include <algorithm>
 #include <cstring>

@@ -10,7 +10,7 @@
 //       if (detail::IsSingle(p, mb, '\\')) ...
 #pragma once
 
-#include "strings/MultiByte.h"
+#include "strings/MultiByteChars.h"
 #include "tekit/strings/String.h"
 
 #include <string>

@@ -2,7 +2,7 @@
 #include "tekit/strings/DecimalPoint.h"
 
 #include "platform/Locale.h"
-#include "strings/MultiByte.h"
+#include "strings/MultiByteChars.h"
 #include "tekit/strings/DynamicString.h"
 #include "tekit/strings/String.h"
 

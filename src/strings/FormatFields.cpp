@@ -2,7 +2,7 @@
 // and pointers without the C runtime.
 #include "strings/FormatFields.h"
 
-#include "strings/MultiByte.h"
+#include "strings/MultiByteChars.h"
 #include "tekit/strings/DynamicString.h"
 
 #include <algorithm>

@@ -2,7 +2,7 @@
 #include "tekit/strings/FormatStringAnalysis.h"
 
 #include "strings/FormatFields.h"
-#include "strings/MultiByte.h"
+#include "strings/MultiByteChars.h"
 
 #include <string>
 #include <string_view>

@@ -1,5 +1,5 @@
 // The multibyte character operations over the process-wide lead-byte table.
-#include "strings/MultiByte.h"
+#include "strings/MultiByteChars.h"
 
 #include "platform/CodePage.h"
 #include "tekit/strings/MultiByte.h"

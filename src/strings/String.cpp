@@ -2,7 +2,7 @@
 // empty block, measures and single characters, obscuring and the string assertion.
 #include "tekit/strings/String.h"
 
-#include "strings/MultiByte.h"
+#include "strings/MultiByteChars.h"
 #include "tekit/errors/Raise.h"
 #include "tekit/strings/CopyOnWriteMemory.h"
 

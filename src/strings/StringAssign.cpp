@@ -1,6 +1,6 @@
 // Assigning and appending: every kind of storage receives text through RequestBufferSize and
 // the copy routines, which truncate silently where the storage cannot grow.
-#include "strings/MultiByte.h"
+#include "strings/MultiByteChars.h"
 #include "strings/WideText.h"
 #include "tekit/errors/Raise.h"
 #include "tekit/strings/String.h"

@@ -5,7 +5,7 @@
 // above 127 and double-byte characters (whose trail byte may look like an ASCII letter) are
 // left alone.
 #include "strings/CharScan.h"
-#include "strings/MultiByte.h"
+#include "strings/MultiByteChars.h"
 #include "strings/TextSearch.h"
 #include "tekit/errors/Raise.h"
 #include "tekit/strings/String.h"

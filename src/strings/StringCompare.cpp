@@ -1,7 +1,7 @@
 // Comparison of strings: by character value in multibyte mode, by unsigned byte otherwise; the
 // case-insensitive forms fold ASCII letters only, like the "C" locale, whatever the process's
 // locale is.
-#include "strings/MultiByte.h"
+#include "strings/MultiByteChars.h"
 #include "tekit/strings/String.h"
 
 #include <algorithm>

@@ -2,7 +2,7 @@
 // case changes and character positions. The MBCS forms always follow the lead-byte table;
 // with no lead bytes they behave as the byte forms. None reads past a terminator or writes
 // outside `destSize` bytes, and a null text is the empty text.
-#include "strings/MultiByte.h"
+#include "strings/MultiByteChars.h"
 #include "tekit/strings/String.h"
 
 #include <algorithm>

@@ -5,7 +5,7 @@
 // copied) when it changes nothing, takes its text arguments aside when they point into the
 // string itself, and keeps the cached size exact.
 #include "strings/CharScan.h"
-#include "strings/MultiByte.h"
+#include "strings/MultiByteChars.h"
 #include "strings/TextEdit.h"
 #include "strings/TextSearch.h"
 #include "tekit/errors/RString.h"

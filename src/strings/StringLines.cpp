@@ -5,7 +5,7 @@
 // in a text file. The walk goes by characters, so in multibyte mode the trail byte of a
 // double-byte character is never taken for a line ending.
 #include "strings/CharScan.h"
-#include "strings/MultiByte.h"
+#include "strings/MultiByteChars.h"
 #include "strings/TextEdit.h"
 #include "strings/TextSearch.h"
 #include "tekit/strings/String.h"

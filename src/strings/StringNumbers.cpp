@@ -7,7 +7,7 @@
 #include "tekit/strings/DynamicString.h"
 #include "tekit/strings/String.h"
 
-#include "strings/MultiByte.h"
+#include "strings/MultiByteChars.h"
 
 #include <algorithm>
 #include <charconv>

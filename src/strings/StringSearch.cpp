@@ -2,7 +2,7 @@
 // space. Every search walks the text by characters, so in multibyte mode nothing is found
 // inside a double-byte character.
 #include "strings/CharScan.h"
-#include "strings/MultiByte.h"
+#include "strings/MultiByteChars.h"
 #include "strings/TextSearch.h"
 #include "tekit/strings/String.h"
 

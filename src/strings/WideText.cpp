@@ -2,7 +2,7 @@
 #include "strings/WideText.h"
 
 #include "platform/TextConversion.h"
-#include "strings/MultiByte.h"
+#include "strings/MultiByteChars.h"
 
 #include <cstring>
 #include <cwchar>

@@ -2,7 +2,7 @@
 // writes nothing when it fails; none lets an exception out.
 #include "tekit/toolbox/TextHelpers.h"
 
-#include "strings/MultiByte.h"
+#include "strings/MultiByteChars.h"
 #include "tekit/errors/TEError.h"
 #include "tekit/strings/String.h"
 #include "toolbox/FlatGuard.h"

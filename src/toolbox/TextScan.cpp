@@ -1,6 +1,6 @@
 #include "toolbox/TextScan.h"
 
-#include "strings/MultiByte.h"
+#include "strings/MultiByteChars.h"
 #include "tekit/strings/String.h"
 
 namespace tekit::toolbox {

@@ -2,7 +2,7 @@
 // by Thompson's construction (the mirror automaton concatenates in the opposite order).
 #include "toolbox/pattern/PatternCompiler.h"
 
-#include "strings/MultiByte.h"
+#include "strings/MultiByteChars.h"
 #include "tekit/toolbox/RegExpr.h"
 
 #include <utility>

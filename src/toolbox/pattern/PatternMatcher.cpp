@@ -1,7 +1,7 @@
 // The pattern matcher: Thompson/Pike simulation of the automata over one line.
 #include "toolbox/pattern/PatternMatcher.h"
 
-#include "strings/MultiByte.h"
+#include "strings/MultiByteChars.h"
 
 #include <algorithm>
 #include <utility>

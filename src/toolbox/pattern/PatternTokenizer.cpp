@@ -1,7 +1,7 @@
 // The pattern tokenizer: one left-to-right pass; the first error found is the one reported.
 #include "toolbox/pattern/PatternTokenizer.h"
 
-#include "strings/MultiByte.h"
+#include "strings/MultiByteChars.h"
 #include "tekit/toolbox/RegExpr.h"
 
 namespace tekit::toolbox::pattern {
