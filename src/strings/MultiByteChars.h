@@ -1,4 +1,4 @@
-// The string family's multibyte character operations (internal), independent of the C runtime's locale.
+// The string family's multibyte character operations, independent of the C runtime's locale.
 //
 // One process-wide 256-entry table says which bytes lead a double-byte character of the ANSI
 // code page (filled at load from the process's code page on Windows, by SetMultiByteCodePage
