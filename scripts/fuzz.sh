@@ -27,6 +27,10 @@ for source in fuzz/*Fuzzer.cpp; do
     short=${name%Fuzzer}
     short=$(tr '[:upper:]' '[:lower:]' <<<"$short")
     [[ -n "$filter" && "$short" != *"$filter"* ]] && continue
+    if [[ ! -x "$build/fuzz/$target" ]]; then
+        echo "==== $target: not built (its peer library is not installed: see fuzz/CMakeLists.txt)"
+        continue
+    fi
     corpus="$build/corpus/$short"
     findings="$build/findings/$short"
     mkdir -p "$corpus" "$findings"
