@@ -11,7 +11,7 @@ namespace {
 // constant that is merely close (today's Planck constant, a Pi from <numbers>) is wrong.
 TEST(Constants, HaveTheirExactValues) {
     struct {
-        double (*function)();
+        double(TEKIT_STDCALL* function)();
         double value;
     } const cases[] = {
         {Pi, 3.141592653589793},
