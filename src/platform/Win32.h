@@ -2,12 +2,6 @@
 // macros, and with the names that collide with the seam's own functions undefined.
 #pragma once
 
-#ifndef WIN32_LEAN_AND_MEAN
-#define WIN32_LEAN_AND_MEAN
-#endif
-#ifndef NOMINMAX
-#define NOMINMAX
-#endif
-#include <windows.h>
+#include "tekit/platform/WinTypes.h" // lean <windows.h>, without the min/max macros
 
 #undef GetEnvironmentVariable

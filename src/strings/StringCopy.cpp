@@ -40,6 +40,17 @@ template <class Cut> void Insert(char* dest, char const* text, int offset, int d
     dest[offset + keepText + keepTail] = '\0';
 }
 
+/// The most bytes a bounded copy may take: destSize - 1, and at most `numBytes` when that is
+/// not negative; -1, with the cached size 0, when there is no room at all.
+int CopyLimit(char const* dest, int numBytes, int destSize, int* cachedSize) {
+    if (!dest || destSize < 1) {
+        if (cachedSize)
+            *cachedSize = 0;
+        return -1;
+    }
+    return numBytes >= 0 ? std::min(destSize - 1, numBytes) : destSize - 1;
+}
+
 } // namespace
 
 void String::StringCopyMax(char* dest, char const* src, int destSize, int* cachedSize) {
@@ -48,14 +59,9 @@ void String::StringCopyMax(char* dest, char const* src, int destSize, int* cache
 
 void String::StringCopyMaxN(char* dest, char const* src, int numBytes, int destSize,
                             int* cachedSize) {
-    if (!dest || destSize < 1) {
-        if (cachedSize)
-            *cachedSize = 0;
+    int const limit = CopyLimit(dest, numBytes, destSize, cachedSize);
+    if (limit < 0)
         return;
-    }
-    int limit = destSize - 1;
-    if (numBytes >= 0)
-        limit = std::min(limit, numBytes);
     int const n = src ? static_cast<int>(strnlen(src, size_t(limit))) : 0;
     if (n > 0)
         std::memmove(dest, src, size_t(n));
@@ -72,14 +78,9 @@ void String::MBCSStringCopyMax(char* dest, char const* src, int destSize, int* c
 // destSize - 1 bytes without splitting a double-byte character.
 void String::MBCSStringCopyMaxN(char* dest, char const* src, int numBytes, int destSize,
                                 int* cachedSize) {
-    if (!dest || destSize < 1) {
-        if (cachedSize)
-            *cachedSize = 0;
+    int const limit = CopyLimit(dest, numBytes, destSize, cachedSize);
+    if (limit < 0)
         return;
-    }
-    int limit = destSize - 1;
-    if (numBytes >= 0)
-        limit = std::min(limit, numBytes);
     StringCopyMaxN(dest, src, MBCSPrefixBytes(src, limit), destSize, cachedSize);
 }
 
