@@ -11,6 +11,7 @@
 #include <chrono>
 #include <cstdlib>
 #include <memory>
+#include <new>
 #include <random>
 #include <string>
 #include <thread>
@@ -78,7 +79,9 @@ TEST(Mutex, UnnamedMutexIsPrivateToItsObject) {
 
 TEST(Mutex, ThreadThatEndsHoldingItLeavesItAbandonedAndAcquirable) {
     Mutex mutex(UniqueName("abandoned").c_str());
-    std::thread([&] { new MutexLock(mutex, 0); }).join(); // never released
+    // The lock lives in static storage and is never destroyed: its thread ends holding it.
+    alignas(MutexLock) static unsigned char storage[sizeof(MutexLock)];
+    std::thread([&] { ::new (storage) MutexLock(mutex, 0); }).join();
     EXPECT_NO_THROW(MutexLock(mutex, 5000));
 }
 
