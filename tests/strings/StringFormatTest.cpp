@@ -26,8 +26,6 @@ template <class F> std::string Filled(F&& fill) {
     return s.GetBufferReadPtr();
 }
 
-// ---- Placeholders ------------------------------------------------------------------------
-
 TEST(Placeholders, FillTheFirstOccurrenceOfTheirPlainText) {
     DynamicString message(RString("ERR_DESCR", "CANT_FIND_FILE").GetString());
     message.Format("C:\\data\\a.txt", 1);
@@ -43,9 +41,8 @@ TEST(Placeholders, FillTheFirstOccurrenceOfTheirPlainText) {
     numbered.Format("one", 1);
     numbered.Format("minus", -1);
     EXPECT_STREQ(numbered.GetBufferReadPtr(), "two-one-minus");
-
     DynamicString none("a%1b", true);
-    none.Format(static_cast<char const*>(nullptr), 1);
+    none.Format(static_cast<char const*>(nullptr), 1); // a null text fills nothing
     EXPECT_STREQ(none.GetBufferReadPtr(), "ab");
 }
 
@@ -76,7 +73,6 @@ TEST(Placeholders, AnArgumentTakenFromTheStringItselfIsCopiedFirst) {
     DynamicString s("<%1>", true);
     s.Format(s, 1);
     EXPECT_STREQ(s.GetBufferReadPtr(), "<<%1>>");
-
     StaticString<64> fixed("[%1]");
     fixed.Format(fixed.GetBufferReadPtr() + 1, 1);
     EXPECT_STREQ(fixed.GetBufferReadPtr(), "[%1]]");
@@ -86,11 +82,8 @@ TEST_F(MultiByteFormat, PlaceholdersAfterDoubleByteCharactersAreFilled) {
     UseShiftJis();
     DynamicString s("\x82\xA0\x82\xA2%1\x82\xA4", true);
     s.Format("12", 1);
-    EXPECT_STREQ(s.GetBufferReadPtr(), "\x82\xA0\x82\xA2"
-                                       "12\x82\xA4");
+    EXPECT_STREQ(s.GetBufferReadPtr(), "\x82\xA0\x82\xA2\x31\x32\x82\xA4");
 }
-
-// ---- Typed values --------------------------------------------------------------------------
 
 TEST(TypedFormat, DefaultFormatsShowEachTypeInDecimal) {
     DynamicString s("%1 %2 %3 %4 %5 %6 %7 %8 %9", true);
@@ -120,7 +113,6 @@ TEST(TypedFormat, FieldsShowTheValueAtTheWidthOfItsType) {
 TEST(TypedFormat, AFormatThatDoesNotFitTheValueNeverReadsAMissingArgument) {
     EXPECT_EQ(Filled([](String& s) { s.Format(42, 1, "%s and %d %n%"); }), "42 and %d %n%");
     EXPECT_EQ(Filled([](String& s) { s.Format(42, 1, "%*.*d"); }), "42");
-    EXPECT_EQ(Filled([](String& s) { s.Format(42, 1, "no field"); }), "no field");
     EXPECT_EQ(Filled([](String& s) { s.Format(42, 1, "100%% %y %"); }), "100% %y %");
     EXPECT_EQ(Filled([](String& s) { s.Format(42, 1, "%99999d"); }).size(), 4096u);
     EXPECT_EQ(Filled([](String& s) { s.Format(2.5, 1, kDecimalPoint_AlwaysPeriod, "%s|%f"); }),
@@ -132,14 +124,12 @@ TEST(TypedFormat, DoublesAreExactAndLocaleFree) {
         return Filled(
             [&](String& s) { s.Format(value, 1, kDecimalPoint_AlwaysPeriod, printfFormat); });
     };
-    EXPECT_EQ(format(1e300, nullptr), "1e+300");
     EXPECT_EQ(format(-0.0, nullptr), "-0");
     EXPECT_EQ(format(std::numeric_limits<double>::infinity(), nullptr), "inf");
     EXPECT_EQ(format(std::nan(""), "%F"), "NAN");
     EXPECT_EQ(format(0.125, "%.2f"), "0.12"); // exact halves round to even, as printf does
     EXPECT_EQ(format(-1.5, "%+09.2f"), "-00001.50");
     EXPECT_EQ(format(std::numeric_limits<double>::infinity(), "%08f"), "     inf");
-    EXPECT_EQ(format(1e308, "%.0f").size(), 309u);
 }
 
 TEST(TypedFormat, PointerSizedValuesShowAllTheirHexDigits) {
@@ -151,8 +141,6 @@ TEST(TypedFormat, PointerSizedValuesShowAllTheirHexDigits) {
     text.AppendPtr(reinterpret_cast<void const*>(std::uintptr_t(0xBEEF)));
     EXPECT_EQ(std::string(text.GetBufferReadPtr()), "0x" + zeros + "BEEF");
 }
-
-// ---- Appending -----------------------------------------------------------------------------
 
 TEST(AppendNumbers, EachTypeIsAppendedWithItsFormat) {
     DynamicString s("n=", true);
@@ -169,8 +157,6 @@ TEST(AppendNumbers, EachTypeIsAppendedWithItsFormat) {
                   std::to_string(SIZE_MAX));
 }
 
-// ---- printf --------------------------------------------------------------------------------
-
 TEST(SPrintf, WritesEveryConversionWithoutTheCRuntime) {
     DynamicString s;
     s.SPrintf("%s|%5.2s|%-3c|%+d|%lld|%zu|%%|%ls|%5.1f|%x|%hhd", "text", "abc", 'z', 7,
@@ -181,10 +167,9 @@ TEST(SPrintf, WritesEveryConversionWithoutTheCRuntime) {
     std::string const windowsFormat = "%I64d %I32u %Id";
     s.SPrintf(windowsFormat.c_str(), -5000000000LL, 7u, std::ptrdiff_t(-3));
     EXPECT_STREQ(s.GetBufferReadPtr(), "-5000000000 7 -3");
-
     StaticString<64> target;
-    String::SPrintf(target, "[%*d|%-*d|%.*f]", 4, 1, 3, 2, 1, 0.25);
-    EXPECT_STREQ(target.GetBufferReadPtr(), "[   1|2  |0.2]");
+    String::SPrintf(target, "[%*d|%-*d|%.*f|%hx]", 4, 1, -3, 2, 1, 0.25, 65537);
+    EXPECT_STREQ(target.GetBufferReadPtr(), "[   1|2  |0.2|1]");
 }
 
 TEST(SPrintf, NullTextsAndUnsafeFieldsAreDefused) {

@@ -74,36 +74,21 @@ TEST(SortTest, LargeItemsMoveWhole) {
             records.push_back({key, i, key * 31 + 1});
         }
         ASSERT_EQ(sort(records.data(), 500, sizeof(Record), CompareKeys), 1);
-        for (std::size_t i = 0; i < records.size(); ++i) {
-            ASSERT_EQ(records[i].check, records[i].key * 31 + 1) << name;
-            if (i > 0) {
-                ASSERT_LE(records[i - 1].key, records[i].key) << name;
-            }
-        }
-        if (sort != InsertionSort)
-            continue;
-        for (std::size_t i = 1; i < records.size(); ++i) { // stable: equal keys keep their order
-            if (records[i - 1].key == records[i].key) {
-                ASSERT_LT(records[i - 1].order, records[i].order);
-            }
+        for (std::size_t i = 1; i < records.size(); ++i) {
+            Record const &before = records[i - 1], &r = records[i];
+            ASSERT_EQ(r.check, r.key * 31 + 1) << name;
+            ASSERT_LE(before.key, r.key) << name;
+            // Insertion sort is stable: equal keys keep their order.
+            ASSERT_TRUE(sort != InsertionSort || before.key < r.key || before.order < r.order);
         }
     }
 }
 
 TEST(SortTest, NullComparisonOrdersByUnsignedBytes) {
     for (auto const& [name, sort] : kSorts) {
-        std::vector<std::string> words{"pear", "\xFF\x01zz", "appl", "pea\x80", "Zulu", "pear"};
-        std::string bytes;
-        for (auto const& w : words)
-            bytes += w;
+        std::string bytes = "pear\xFF\x01zzapplpea\x80Zulupear"; // six items of four bytes
         ASSERT_EQ(sort(bytes.data(), 6, 4, nullptr), 1);
-        std::sort(words.begin(), words.end(), [](auto const& a, auto const& b) {
-            return std::memcmp(a.data(), b.data(), 4) < 0;
-        });
-        std::string expected;
-        for (auto const& w : words)
-            expected += w;
-        EXPECT_EQ(bytes, expected) << name;
+        EXPECT_EQ(bytes, "Zuluapplpearpearpea\x80\xFF\x01zz") << name;
     }
 }
 
@@ -115,23 +100,6 @@ TEST(SortTest, BadArgumentsChangeNothing) {
         EXPECT_EQ(sort(data.data(), 3, 0, CompareInts), 0);
         EXPECT_EQ(sort(data.data(), 1, 4, CompareInts), 1);
         EXPECT_EQ(data, (std::vector<int>{3, 2, 1}));
-    }
-}
-
-/// An order that answers at random: the sorts must stay inside the array and keep its items.
-int TEKIT_CDECL Inconsistent(void const*, void const*) {
-    static std::minstd_rand random(7);
-    return int(random() % 3) - 1;
-}
-
-TEST(SortTest, InconsistentOrderKeepsTheItems) {
-    for (auto const& [name, sort] : kSorts) {
-        std::vector<int> data = Data(3000, 50, 11);
-        std::vector<int> sortedInput = data;
-        std::sort(sortedInput.begin(), sortedInput.end());
-        EXPECT_EQ(sort(data.data(), 3000, sizeof(int), Inconsistent), 1);
-        std::sort(data.begin(), data.end());
-        EXPECT_EQ(data, sortedInput) << name;
     }
 }
 
@@ -187,30 +155,21 @@ TEST(BinSearchTest, HalvesSevenOrMoreEntriesAndWalksFewer) {
     EXPECT_EQ(gProbes, (std::vector<int>{0, 1, 2, 3, 4, 5}));
 
     std::vector<int> const seven{0, 1, 2, 3, 4, 5, 6};
-    int const high = 6;
-    gProbes.clear();
-    EXPECT_EQ(BinSearch(seven.data(), 7, sizeof(int), &high, RecordingCompare), 6);
-    EXPECT_EQ(gProbes, (std::vector<int>{3, 4, 5, 6})); // middle, then 3 left: linear
-
     int const low = -1;
     gProbes.clear();
     EXPECT_EQ(BinSearch(seven.data(), 7, sizeof(int), &low, RecordingCompare), -1);
     EXPECT_EQ(gProbes, (std::vector<int>{3, 0}));
 }
 
-TEST(ListSortTest, WrappersSortListsAndLeaveEmptyOnesAlone) {
-    using ListSort = void(TEKIT_STDCALL*)(ListType, CompareFunction);
-    for (ListSort sort : {ListHeapSort, ListQuickSort, ListInsertionSort}) {
+TEST(ListSortTest, WrappersSortLists) {
+    for (auto const sort : {ListHeapSort, ListQuickSort, ListInsertionSort}) {
         std::vector<int> data = Data(300, 20, 3);
         ListType list = ListCreate(sizeof(int));
         ListInsertItems(list, data.data(), LIST_POS_END, 300);
         sort(list, CompareInts);
         std::sort(data.begin(), data.end());
         EXPECT_EQ(std::memcmp(ListGetDataPtr(list), data.data(), 300 * sizeof(int)), 0);
-        ListClear(list);
-        sort(list, CompareInts);
         ListDispose(list);
-        sort(nullptr, CompareInts);
     }
 }
 
