@@ -16,15 +16,8 @@ namespace {
 
 constexpr int kRounds = 3000;
 
-class EscapeRoundTrip : public tekit::testing::MultiByteFixture,
-                        public ::testing::WithParamInterface<bool> {
+class EscapeRoundTrip : public tekit::testing::BothByteModes {
 protected:
-    void SetUp() override {
-        MultiByteFixture::SetUp();
-        if (GetParam())
-            UseShiftJis();
-    }
-
     /// Bytes 1 to 255, one in three from the characters that the escapers care about.
     std::string AnyText() {
         static char const kSpecial[] = "\\\"'<>&\t\n\r\x01\x1f\x7f;#x0aA,|";

@@ -53,15 +53,8 @@ double RandomDouble(std::mt19937_64& random, int i) {
 }
 
 /// Runs every case with multibyte mode off and on (Shift-JIS lead bytes).
-class FormatRoundTrip : public testing::MultiByteFixture,
-                        public ::testing::WithParamInterface<bool> {
+class FormatRoundTrip : public tekit::testing::BothByteModes {
 protected:
-    void SetUp() override {
-        MultiByteFixture::SetUp();
-        if (GetParam())
-            UseShiftJis();
-    }
-
     /// The template: double-byte characters around the placeholder when multibyte mode is on,
     /// so that reading back has to count characters.
     DynamicString Template() const {

@@ -30,4 +30,15 @@ private:
     bool m_savedMode = false;
 };
 
+/// Runs each case of a parameterised test twice: with multibyte mode off (false) and with
+/// Shift-JIS lead bytes and multibyte mode on (true).
+class BothByteModes : public MultiByteFixture, public ::testing::WithParamInterface<bool> {
+protected:
+    void SetUp() override {
+        MultiByteFixture::SetUp();
+        if (GetParam())
+            UseShiftJis();
+    }
+};
+
 } // namespace tekit::testing
