@@ -1,3 +1,5 @@
+// The global interface table where there is no COM: IUnknown pointers under cookies, in
+// process, so the interface-table pointer and the releaser run the same code.
 #include "platform/InterfaceTable.h"
 
 #include <map>
@@ -24,6 +26,22 @@ struct Table {
 Table& TheTable() {
     static Table* const table = new Table; // outlives every static that may still revoke
     return *table;
+}
+
+/// The object registered under `cookie`, or null: removed from the table with its reference
+/// when `remove`, else with a new reference added.
+IUnknown* TakeEntry(InterfaceTableHandle raw, std::uint32_t cookie, bool remove) {
+    auto& table = *static_cast<Table*>(raw);
+    std::lock_guard<std::mutex> hold(table.mutex);
+    auto const found = table.entries.find(cookie);
+    if (found == table.entries.end())
+        return nullptr;
+    IUnknown* const object = found->second.object;
+    if (remove)
+        table.entries.erase(found);
+    else
+        object->AddRef();
+    return object;
 }
 
 } // namespace
@@ -55,16 +73,9 @@ long RegisterInterfaceInTable(InterfaceTableHandle raw, IUnknown* object, GUID c
 }
 
 long RevokeInterfaceFromTable(InterfaceTableHandle raw, std::uint32_t cookie) {
-    auto& table = *static_cast<Table*>(raw);
-    IUnknown* object = nullptr;
-    {
-        std::lock_guard<std::mutex> hold(table.mutex);
-        auto const found = table.entries.find(cookie);
-        if (found == table.entries.end())
-            return kInvalidArgument;
-        object = found->second.object;
-        table.entries.erase(found);
-    }
+    IUnknown* const object = TakeEntry(raw, cookie, true);
+    if (object == nullptr)
+        return kInvalidArgument;
     object->Release(); // outside the table's lock: a release may run any amount of code
     return 0;
 }
@@ -72,16 +83,10 @@ long RevokeInterfaceFromTable(InterfaceTableHandle raw, std::uint32_t cookie) {
 long GetInterfaceFromTable(InterfaceTableHandle raw, std::uint32_t cookie, GUID const& iid,
                            void** result) {
     *result = nullptr;
-    auto& table = *static_cast<Table*>(raw);
-    IUnknown* object = nullptr;
-    {
-        std::lock_guard<std::mutex> hold(table.mutex);
-        auto const found = table.entries.find(cookie);
-        if (found == table.entries.end())
-            return kInvalidArgument;
-        object = found->second.object;
-        object->AddRef(); // keeps it alive against a revocation while we query it
-    }
+    // Held by a reference of our own while we query it, against a revocation meanwhile.
+    IUnknown* const object = TakeEntry(raw, cookie, false);
+    if (object == nullptr)
+        return kInvalidArgument;
     long const hr = object->QueryInterface(iid, result);
     object->Release();
     return hr;
