@@ -1,3 +1,4 @@
+// Shows a fatal assertion's text to the user before the process aborts: the POSIX implementation.
 #include "platform/AssertBox.h"
 
 #include <cstdio>

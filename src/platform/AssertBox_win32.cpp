@@ -1,3 +1,4 @@
+// Shows a fatal assertion's text to the user before the process aborts: the Windows implementation.
 #include "platform/AssertBox.h"
 #include "platform/Win32.h"
 

@@ -1,3 +1,4 @@
+// The POSIX implementation of platform/Clock.h.
 #include "platform/Clock.h"
 
 #include <cerrno>

@@ -1,3 +1,4 @@
+// The Windows implementation of platform/Clock.h.
 #include "platform/Clock.h"
 #include "platform/Win32.h"
 

@@ -1,3 +1,4 @@
+// The POSIX implementation of platform/CodePage.h.
 #include "platform/CodePage.h"
 
 namespace tekit::platform {

@@ -1,3 +1,4 @@
+// The Windows implementation of platform/CodePage.h.
 #include "platform/CodePage.h"
 #include "platform/Win32.h"
 

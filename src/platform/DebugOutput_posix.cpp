@@ -1,3 +1,4 @@
+// The POSIX implementation of platform/DebugOutput.h.
 #include "platform/DebugOutput.h"
 
 #include <cstdio>

@@ -1,3 +1,4 @@
+// The Windows implementation of platform/DebugOutput.h.
 #include "platform/DebugOutput.h"
 #include "platform/Win32.h"
 

@@ -1,3 +1,4 @@
+// The process's environment variables: the POSIX implementation.
 #include "platform/Environment.h"
 
 #include <cstdlib>

@@ -1,3 +1,4 @@
+// The process's environment variables: the Windows implementation.
 #include "platform/Environment.h"
 #include "platform/Win32.h"
 

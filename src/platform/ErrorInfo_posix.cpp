@@ -1,3 +1,4 @@
+// The POSIX implementation of platform/ErrorInfo.h.
 #include "platform/ErrorInfo.h"
 
 #include <utility>

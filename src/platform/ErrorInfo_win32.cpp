@@ -1,3 +1,4 @@
+// The Windows implementation of platform/ErrorInfo.h.
 #include "platform/CodePage.h"
 #include "platform/ErrorInfo.h"
 #include "platform/TextConversion.h"

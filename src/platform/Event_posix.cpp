@@ -1,3 +1,4 @@
+// The POSIX implementation of platform/Event.h.
 #include "platform/Event.h"
 
 #include <atomic>

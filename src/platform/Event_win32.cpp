@@ -1,3 +1,4 @@
+// The Windows implementation of platform/Event.h.
 #include "platform/Event.h"
 #include "platform/Win32.h"
 

@@ -1,3 +1,4 @@
+// The Windows implementation of platform/InterfaceTable.h.
 #include "platform/InterfaceTable.h"
 #include "platform/Win32.h"
 

@@ -1,3 +1,4 @@
+// The POSIX implementation of platform/MessageLoop.h.
 #include "platform/MessageLoop.h"
 
 #include <pthread.h>

@@ -1,3 +1,4 @@
+// The Windows implementation of platform/MessageLoop.h.
 #include "platform/MessageLoop.h"
 #include "platform/Win32.h"
 

@@ -1,3 +1,4 @@
+// The system's sound output, for audible operator signals: the POSIX implementation.
 #include "platform/Sound.h"
 
 namespace tekit::platform {

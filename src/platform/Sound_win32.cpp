@@ -1,3 +1,4 @@
+// The system's sound output, for audible operator signals: the Windows implementation.
 #include "platform/Sound.h"
 #include "platform/Win32.h"
 

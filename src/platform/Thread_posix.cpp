@@ -1,3 +1,4 @@
+// The calling thread's identity: the POSIX implementation.
 #include "platform/Thread.h"
 
 #include <atomic>

@@ -1,3 +1,4 @@
+// The calling thread's identity: the Windows implementation.
 #include "platform/Thread.h"
 #include "platform/Win32.h"
 

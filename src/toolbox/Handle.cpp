@@ -1,3 +1,4 @@
+// Handles: relocatable heap blocks behind a record that stays put, and their null-handle assertion.
 #include "tekit/toolbox/Handle.h"
 
 #include "platform/AssertBox.h"

@@ -1,3 +1,4 @@
+// Text scanning for the toolbox's text helpers: "C" locale white space and case, multibyte-aware.
 #include "toolbox/TextScan.h"
 
 #include "strings/MultiByteChars.h"
