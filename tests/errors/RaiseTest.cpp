@@ -38,6 +38,8 @@ TEST_F(Raising, MacroRecordsTheSitesFileLineAndBuildStamp) {
     EXPECT_TRUE(
         std::regex_match(e.GetCompilationDate(), std::regex("[A-Z][a-z]{2} [ 1-3][0-9] [0-9]{4}")))
         << e.GetCompilationDate();
+    EXPECT_TRUE(std::regex_match(e.GetCompilationTime(), std::regex("[0-9]{2}:[0-9]{2}:[0-9]{2}")))
+        << e.GetCompilationTime();
 
     TEException const api =
         Raised([] { TE_RAISE_API(TE_IO_ERROR, nullptr, "OVBinaryFileStream::Read", "read", 5); });
@@ -50,10 +52,15 @@ TEST_F(Raising, AssertionKeepsItsTextOnlyAboveDiagnosticLevelZero) {
         RaiseTEAssertion("index < size", "Cache::Get", TE_PROGRAM_ERROR, false, nullptr, 0, nullptr,
                          "Cache", 42, "Jan  1 2024", "00:00:00");
     };
+    auto const fromString = [] {
+        RaiseTEAssertion(DynamicString("index < size", true), "Cache::Get", TE_PROGRAM_ERROR, false,
+                         nullptr, 0, nullptr, "Cache", 42, "Jan  1 2024", "00:00:00");
+    };
     for (int level : {0, 1}) {
         DiagnosticLevelScope scope(level);
         char const* const text = level > 0 ? "index < size" : "Program error.";
         EXPECT_RAISES_IN(fromText(), TE_PROGRAM_ERROR, "Cache::Get", text);
+        EXPECT_RAISES_IN(fromString(), TE_PROGRAM_ERROR, "Cache::Get", text);
         EXPECT_RAISES_IN(TE_ASSERT(1 == 2, "Cache::Get"), TE_PROGRAM_ERROR, "Cache::Get",
                          level > 0 ? "Assertion failed: 1 == 2" : "Program error.");
     }
@@ -64,6 +71,7 @@ TEST_F(Raising, SystemErrorsBecomeTheirTEErrorWithTheSystemsText) {
         Raised([] { RaiseTESystemException(5, "Registry", 17, "Jan  1 2024", "00:00:00"); });
     EXPECT_EQ(denied.GetErrorCode(), TE_ACCESS_DENIED);
     EXPECT_EQ(denied.GetAPIErrorCode(), 5);
+    EXPECT_STREQ(denied.GetFileName(), "Registry");
 
     TEException const other = Raised(
         [] { RaiseTESystemException(0x8000FFFFu, "Registry", 18, "Jan  1 2024", "00:00:00"); });
@@ -141,4 +149,8 @@ TEST(DestructorExceptions, AreReportedAsWarningsAtAnyLevelAndNeverRethrown) {
 
     std::string const other = ReportOf([] { throw 42; });
     EXPECT_NE(other.find("'Exception caught in destructor: unknown exception'"), std::string::npos);
+
+    DebugCapture capture;
+    TEException::HandleDestructorException("f", "file", 1, "d", "t"); // outside any catch
+    EXPECT_NE(capture.Text().find("unknown exception"), std::string::npos);
 }

@@ -48,7 +48,9 @@ TEST(TEException, CopiesAreIndependentValuesAndTheDescriptionGrowsAtEitherEnd) {
     copy.SetFunctionName(DynamicString("Other::Function", true));
     EXPECT_STREQ(original.GetDescription(), "middle");
     EXPECT_STREQ(assigned.GetDescription(), "start middle end");
-    EXPECT_STREQ(assigned.GetFunctionName(), "OVMemoryStream::ReadInt");
+    DynamicString function;
+    assigned.GetFunctionName(function);
+    EXPECT_STREQ(function.GetBufferReadPtr(), "OVMemoryStream::ReadInt");
 }
 
 TEST(TEException, ThirtyTwoBitFieldsAndTheHelpFileKeepTheirWindowsLimits) {
@@ -76,7 +78,9 @@ TEST(TEException, DebugDumpShowsEveryField) {
 
     DebugCapture capture;
     e.Debug("To the debug output", nullptr);
+    Make("quiet", TE_IO_ERROR, false);
     EXPECT_EQ(capture.Text().rfind("To the debug output\n", 0), 0u);
+    EXPECT_EQ(capture.Text().find("quiet"), std::string::npos);
     DebugCapture onConstruction;
     Make("loud", TE_IO_ERROR, true);
     EXPECT_EQ(onConstruction.Text().rfind("Debugging When Exception Constructed\n", 0), 0u);

@@ -101,15 +101,20 @@ TEST(PathComponents, GettersGiveTheSplitTexts) {
     EXPECT_TRUE(path.HasExtension(".INI"));
     EXPECT_EQ(Component(Path("C:\\f"), &PathBase::GetDirectoryPathName), "C:\\");
     EXPECT_EQ(Component(Path("C:\\a\\"), &PathBase::GetDirectoryPathName), "C:\\a");
+    EXPECT_EQ(Component(Path("C:\\.profile"), &PathBase::GetBaseName), "");
     EXPECT_FALSE(Path("C:\\d.x\\f").HasExtension(nullptr));
+    EXPECT_TRUE(Path("a.").HasExtension());
+    EXPECT_EQ(Component(Path("C:\\a\\"), &PathBase::GetFileName), "");
 }
 
 TEST(PathComponents, SettersReplaceOnePartAndKeepTheRest) {
     Path path("C:\\dir\\report.ini");
     path.SetExtension(".old");
     EXPECT_STREQ(path.CStr(), "C:\\dir\\report.old");
+    path.SetExtension("");
+    EXPECT_STREQ(path.CStr(), "C:\\dir\\report");
     path.SetBaseName("summary");
-    EXPECT_STREQ(path.CStr(), "C:\\dir\\summary.old");
+    EXPECT_STREQ(path.CStr(), "C:\\dir\\summary");
     path.SetFileName(DynamicString("log.csv", true));
     EXPECT_STREQ(path.CStr(), "C:\\dir\\log.csv");
     path.SetDirectoryPathName("D:\\archive\\");
@@ -125,7 +130,11 @@ TEST(PathComponents, SettersReplaceOnePartAndKeepTheRest) {
 }
 
 TEST(PathComponents, AppendAddsOneSeparatorUnlessTheEndHasOne) {
-    Path path("C:\\");
+    Path path;
+    path.Append("a");
+    path.Append("b");
+    EXPECT_STREQ(path.CStr(), "a\\b");
+    path = "C:\\";
     path.Append("x");
     path.Append(DynamicString("\\y", true)); // the component goes in unchanged
     EXPECT_STREQ(path.CStr(), "C:\\x\\\\y");
@@ -135,6 +144,12 @@ TEST(PathComponents, AppendAddsOneSeparatorUnlessTheEndHasOne) {
 }
 
 TEST(PathComponents, RemovingComponentsNeverCutsIntoTheRoot) {
+    Path path("C:\\a\\b.txt");
+    path.RemoveFileComponent();
+    path.RemoveFileComponent();
+    path.RemoveFileComponent();
+    EXPECT_STREQ(path.CStr(), "C:\\");
+
     Path directory("C:\\a\\b\\");
     directory.RemoveFileComponent();
     EXPECT_STREQ(directory.CStr(), "C:\\a\\b\\");
@@ -142,7 +157,6 @@ TEST(PathComponents, RemovingComponentsNeverCutsIntoTheRoot) {
     EXPECT_STREQ(directory.CStr(), "C:\\a");
     directory.RemoveLastComponent();
     directory.RemoveLastComponent();
-    directory.RemoveFileComponent();
     EXPECT_STREQ(directory.CStr(), "C:\\");
     Path share("\\\\srv\\share\\d");
     share.RemoveLastComponent();
@@ -176,13 +190,14 @@ TEST(PathComponents, ConvertToDirectoryAddsTheSeparatorOnce) {
 
 TEST(PathComponents, CommandFileExtensions) {
     DynamicString extension;
+    char const* const expected[] = {"exe", "com", "cmd", "bat"};
     ASSERT_EQ(PathBase::kNumCmdFileExtensions, 4);
-    long i = 0;
-    for (char const* const expected : {"exe", "com", "cmd", "bat"}) {
-        PathBase::GetCmdFileExtension(i++, extension);
-        EXPECT_EQ(extension, expected);
+    for (long i = 0; i < PathBase::kNumCmdFileExtensions; ++i) {
+        PathBase::GetCmdFileExtension(i, extension);
+        EXPECT_EQ(extension, expected[i]);
         EXPECT_TRUE(PathBase::IsCmdFileExtension(extension));
     }
+    EXPECT_TRUE(PathBase::IsCmdFileExtension(DynamicString("BaT", true)));
     EXPECT_FALSE(PathBase::IsCmdFileExtension(DynamicString(".exe", true)));
 }
 
@@ -196,7 +211,9 @@ TEST_F(PathSplittingMultiByte, IndicesCountCharactersAndTrailBytesStayInTheirCha
     UseShiftJis();
     ASSERT_TRUE(PathBase::FindFileName(text, start, length));
     EXPECT_EQ(std::pair(start, length), std::pair(5, 5));
-    EXPECT_EQ(Path(text).GetNumLevels(), 2);
+    Path const path(text);
+    EXPECT_EQ(path.GetNumLevels(), 2);
+    EXPECT_EQ(Component(path, &PathBase::GetDirectoryPathName), "C:\\\x95\x5C");
 
     Path directory("C:\\d\\\x95\x5C"); // ends in a character, not in a separator
     EXPECT_FALSE(directory.IsDirectory());

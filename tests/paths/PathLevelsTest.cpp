@@ -42,14 +42,21 @@ TEST(PathLevels, LevelsFollowTheRootAndATrailingSeparatorAddsNone) {
     };
     for (auto const& [text, count] : levels)
         EXPECT_EQ(Path(text).GetNumLevels(), count) << text;
-    EXPECT_EQ(Path("C:\\a\\b").GetNumPathNameComponents(), 3);
-    EXPECT_EQ(Path("\\\\srv\\share\\a").GetNumPathNameComponents(), 2);
+    std::pair<char const*, int> const components[] = {
+        {"C:\\a\\b", 3},
+        {"a\\b", 2},
+        {"\\\\srv\\share\\a", 2},
+        {"", 0},
+    };
+    for (auto const& [text, count] : components)
+        EXPECT_EQ(Path(text).GetNumPathNameComponents(), count) << text;
 }
 
 TEST(PathLevels, LeadingComponentsCountTheRootAsOne) {
     EXPECT_EQ(UpTo("C:\\a\\b", -3), "");
     EXPECT_EQ(UpTo("C:\\a\\b", 1), "C:\\");
     EXPECT_EQ(UpTo("C:\\a\\b\\", 9), "C:\\a\\b");
+    EXPECT_EQ(UpTo("a\\b\\c", 2), "a\\b");
     EXPECT_EQ(UpTo("\\\\srv\\sh\\a\\b", 2), "\\\\srv\\sh\\a");
 }
 
@@ -66,10 +73,11 @@ TEST(PathLevels, PrefixBeforeASuffixAndSuffixAfterAPrefix) {
     EXPECT_EQ(PrefixBefore("C:\\a\\b\\c", "B\\c"), "C:\\a");
     EXPECT_EQ(PrefixBefore("C:\\a\\b\\c", "x\\c"), "false:unchanged");
     EXPECT_EQ(PrefixBefore("C:\\a\\b\\c", "c:\\A\\b\\c"), ""); // rooted: whole path
-
     EXPECT_EQ(PrefixBefore("C:\\a\\b\\c", "C:\\a"), "false:unchanged");
+
     EXPECT_EQ(SuffixAfter("C:\\a\\b\\c", "c:\\A"), "b\\c");
-    EXPECT_EQ(SuffixAfter("C:\\a\\b\\c\\", "C:\\a\\"), "b\\c\\");    // the rest as written
+    EXPECT_EQ(SuffixAfter("C:\\a\\b\\c\\", "C:\\a\\"), "b\\c\\"); // the rest as written
+    EXPECT_EQ(SuffixAfter("C:\\a\\b", "C:\\a\\b"), "");
     EXPECT_EQ(SuffixAfter("C:\\ab\\c", "C:\\a"), "false:unchanged"); // whole levels only
     EXPECT_EQ(SuffixAfter("C:\\a\\b", "a"), "false:unchanged");
     EXPECT_EQ(SuffixAfter("\\\\srv\\sh\\a", "\\\\SRV\\sh"), "a");
@@ -78,20 +86,27 @@ TEST(PathLevels, PrefixBeforeASuffixAndSuffixAfterAPrefix) {
 TEST(PathLevels, PrefixAndSuffixOfAnAbsolutePath) {
     Path const whole("C:\\a\\b\\c.txt");
     EXPECT_TRUE(Path("c:\\A\\").IsPrefixOfAbsolutePath(whole, false));
+    EXPECT_TRUE(Path("C:\\").IsPrefixOfAbsolutePath(whole, false));
     EXPECT_FALSE(whole.IsPrefixOfAbsolutePath(whole, false));
     EXPECT_TRUE(whole.IsPrefixOfAbsolutePath(whole, true));
+    EXPECT_FALSE(Path("a").IsPrefixOfAbsolutePath(whole, true));
     EXPECT_FALSE(Path("C:\\a\\b").IsPrefixOfAbsolutePath(Path("a\\b\\c"), true));
 
     EXPECT_TRUE(Path("b\\C.TXT").IsSuffixOfAbsolutePath(whole));
     EXPECT_FALSE(Path("a\\c.txt").IsSuffixOfAbsolutePath(whole));
     EXPECT_FALSE(Path("x\\a\\b\\c.txt").IsSuffixOfAbsolutePath(whole));
+    EXPECT_TRUE(whole.IsSuffixOfAbsolutePath(whole));
     EXPECT_FALSE(Path("C:\\b\\c.txt").IsSuffixOfAbsolutePath(whole));
     EXPECT_FALSE(Path("").IsSuffixOfAbsolutePath(whole));
 }
 
 TEST(PathLevels, RootDirectoryIsADirectoryText) {
     std::pair<char const*, char const*> const roots[] = {
-        {"C:\\a\\b", "C:\\"}, {"\\\\srv\\sh", "\\\\srv\\sh\\"}, {"\\a", "\\"}, {"a\\b", ""}};
+        {"C:\\a\\b", "C:\\"},
+        {"\\\\srv\\sh", "\\\\srv\\sh\\"},
+        {"\\a", "\\"},
+        {"a\\b", ""},
+    };
     for (auto const& [text, root] : roots)
         EXPECT_STREQ(Path(text).GetRootDir().CStr(), root) << text;
 }
@@ -100,6 +115,7 @@ TEST(PathLevels, CommonPrefixIsMadeOfWholeLevels) {
     EXPECT_EQ(Common("C:\\a\\b\\c", "c:\\A\\b\\d"), "C:\\a\\b");
     EXPECT_EQ(Common("C:\\ab", "C:\\abc"), "C:\\");
     EXPECT_EQ(Common("C:\\a", "D:\\a"), "");
+    EXPECT_EQ(Common("a\\b", "C:\\a\\b"), "");
     EXPECT_EQ(Common("\\\\srv\\sh\\x", "\\\\srv\\sh\\y"), "\\\\srv\\sh");
     EXPECT_EQ(Common("\\\\srv\\sh\\x", "\\\\srv\\other\\x"), "");
 }
@@ -120,6 +136,8 @@ TEST(PathLevels, DirectoryHoldsPathsAndLibraryEntries) {
     EXPECT_STREQ(info.libraryPath.GetBufferReadPtr(), "C:\\d\\tools.LWB");
     EXPECT_STREQ(info.entryName.GetBufferReadPtr(), "Main.vi");
 
+    EXPECT_TRUE(directory.SubDirectoryContainsPath(Path("C:\\d\\s\\t\\f.txt"), &info));
+    EXPECT_FALSE(info.isInLibrary);
     EXPECT_TRUE(directory.SubDirectoryContainsPath(Path("C:\\d\\s\\x.lwb\\e"), &info));
     EXPECT_STREQ(info.libraryPath.GetBufferReadPtr(), "C:\\d\\s\\x.lwb");
     EXPECT_FALSE(directory.SubDirectoryContainsPath(Path("D:\\d\\f"), &info));

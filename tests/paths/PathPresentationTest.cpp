@@ -32,16 +32,19 @@ TEST(PathAbbreviation, MiddleLevelsGiveWayFromTheFront) {
     EXPECT_EQ(Abbreviated(path, 21), "C:\\first\\...\\file.txt");
     EXPECT_EQ(Abbreviated(path, 20), "C:\\...\\file.txt"); // then the first level goes too
     EXPECT_EQ(Abbreviated("\\\\srv\\share\\a\\b\\c\\f.txt", 22), "\\\\srv\\share\\...\\f.txt");
+    EXPECT_EQ(Abbreviated("a\\b\\c\\d\\f.txt", 10), "...\\f.txt");
 }
 
 TEST(PathAbbreviation, ATooLongFileNameStandsAlone) {
     EXPECT_EQ(Abbreviated("C:\\a\\b\\verylongname.txt", 10), "verylongname.txt");
     EXPECT_EQ(Abbreviated("C:\\aaa\\bbb\\file12.txt", 16), "file12.txt"); // 10 + 4 + 3 >= 16
+    EXPECT_EQ(Abbreviated("C:\\a\\b", -1), "b");
     EXPECT_EQ(Abbreviated("\\\\machine-name-only", 5), "machine-name-only");
 }
 
 TEST(PathAbbreviation, DirectoryTextsKeepTheirLastLevel) {
     EXPECT_EQ(Abbreviated("C:\\first\\second\\third\\", 18), "C:\\...\\third\\");
+    EXPECT_EQ(Abbreviated("C:\\first\\a-very-long-last-level\\", 20), "a-very-long-last-level\\");
 }
 
 class PathAbbreviationMultiByte : public tekit::testing::MultiByteFixture {};
@@ -69,6 +72,7 @@ TEST(PathLongForm, PrefixesAreAddedWithoutLookingAtTheText) {
     EXPECT_EQ(LongForm("C:\\dir\\f.txt"), "\\\\?\\C:\\dir\\f.txt");
     EXPECT_EQ(LongForm("\\\\srv\\share\\f"), "\\\\?\\UNC\\srv\\share\\f");
     EXPECT_EQ(LongForm("\\\\?\\C:\\f"), "\\\\?\\UNC\\?\\C:\\f"); // converted again
+    EXPECT_EQ(LongForm("rel/f"), "\\\\?\\rel/f");
 }
 
 TEST(PathLongForm, WideFormForTheSystemCalls) {
@@ -110,7 +114,8 @@ TEST(PathAbbreviationToFit, ShortensToAPixelWidth) {
               "C:\\first\\...\\m3\\file.txt");
     EXPECT_EQ(Fitted(path, Width("C:\\...\\file.txt"), false), "C:\\...\\file.txt");
     EXPECT_EQ(Fitted(path, 1, false), "file.txt");
-    EXPECT_EQ(Fitted(path, Width("fil..."), true), "fil...");
+    std::string const cut = Fitted(path, Width("fil..."), true);
+    EXPECT_EQ(cut, "fil...");
     EXPECT_EQ(Fitted(path, 0, true), "...");
 }
 #endif

@@ -39,8 +39,11 @@ TEST(PathStorage, CopiesAndMovesAreIndependentValues) {
     Path moved(std::move(copy));
     EXPECT_STREQ(moved.CStr(), "C:\\a\\f.bak");
     Path assigned;
+    assigned = moved;
     assigned = std::move(moved);
     EXPECT_STREQ(assigned.CStr(), "C:\\a\\f.bak");
+    assigned = DynamicString("x:y", true);
+    EXPECT_STREQ(assigned.CStr(), "x:\\y");
     assigned = DynamicPath("d:\\e");
     assigned.SetPathName(assigned);
     EXPECT_STREQ(assigned.CStr(), "d:\\e");
@@ -50,6 +53,9 @@ TEST(PathStorage, CopiesAndMovesAreIndependentValues) {
     sharing.Append("y");
     EXPECT_STREQ(dynamic.CStr(), "C:\\x");
     EXPECT_STREQ(sharing.CStr(), "C:\\x\\y");
+    DynamicString name;
+    sharing.GetPathName(name);
+    EXPECT_EQ(name, "C:\\x\\y");
 }
 
 TEST(PathComparison, EqualityAndOrderIgnoreCase) {
@@ -57,6 +63,7 @@ TEST(PathComparison, EqualityAndOrderIgnoreCase) {
     EXPECT_TRUE(path == Path("c:\\dir\\file.txt"));
     EXPECT_TRUE(path == DynamicString("C:\\DIR\\FILE.txt", true));
     EXPECT_TRUE(path != "c:\\dir\\file.txt ");
+    EXPECT_TRUE(path != static_cast<char const*>(nullptr));
     EXPECT_TRUE(Path() == static_cast<char const*>(nullptr));
     EXPECT_TRUE(path.ShortPathNameAwareEquals("C:\\dir\\file.txt", false));
 }
