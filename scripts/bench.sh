@@ -16,36 +16,20 @@ if [[ $# -gt 0 && "$1" != -* ]]; then
 fi
 
 scripts/install-deps.sh --linux >&2
-# Qt 5 Core (QString) is a peer of the string benchmarks only: installed here when missing,
-# never by the tests; without it bench_strings leaves the QString cases out.
-if ! dpkg-query -W -f='${Status}' qtbase5-dev 2>/dev/null | grep -q "install ok installed"; then
-    if [[ $(id -u) -eq 0 ]]; then
-        echo "bench: installing qtbase5-dev" >&2
-        apt-get update >&2 && apt-get install -y --no-install-recommends qtbase5-dev >&2
-    else
-        echo "bench: qtbase5-dev missing (sudo apt-get install qtbase5-dev): no QString column" >&2
-    fi
-fi
-# The pattern benchmark's peers, installed here only (the test command never needs them);
-# bench_patterns measures against std::regex alone where they are missing.
-missing=()
-for package in libre2-dev libpcre2-dev; do
-    dpkg -s "$package" >/dev/null 2>&1 || missing+=("$package")
+# The peers of the comparisons, installed here only, never by the test command: Qt 5 Core
+# (QString, bench_strings), RE2 and PCRE2 (bench_patterns), POCO (bench_sync). A program
+# whose peer is missing leaves that column out.
+peers=()
+for package in qtbase5-dev libre2-dev libpcre2-dev libpoco-dev; do
+    dpkg-query -W -f='${Status}' "$package" 2>/dev/null | grep -q "install ok installed" ||
+        peers+=("$package")
 done
-if [[ ${#missing[@]} -gt 0 ]]; then
+if [[ ${#peers[@]} -gt 0 ]]; then
     if [[ $(id -u) -eq 0 ]]; then
-        apt-get install -y --no-install-recommends "${missing[@]}" >&2
+        echo "bench: installing ${peers[*]}" >&2
+        apt-get update >&2 && apt-get install -y --no-install-recommends "${peers[@]}" >&2
     else
-        echo "bench.sh: not root, so ${missing[*]} stay missing" >&2
-    fi
-fi
-# POCO is a peer of the lock benchmarks only: installed here when missing, never by the tests.
-if ! dpkg-query -W -f='${Status}' libpoco-dev 2>/dev/null | grep -q "install ok installed"; then
-    if [[ $(id -u) -eq 0 ]]; then
-        echo "bench: installing libpoco-dev" >&2
-        apt-get update >&2 && apt-get install -y --no-install-recommends libpoco-dev >&2
-    else
-        echo "bench: libpoco-dev missing (sudo apt-get install libpoco-dev): no POCO column" >&2
+        echo "bench: missing ${peers[*]} (sudo apt-get install ...): their columns are left out" >&2
     fi
 fi
 cmake --preset release >/dev/null
