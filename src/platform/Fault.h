@@ -32,6 +32,7 @@ enum class FaultKind : unsigned char {
     DirectoryList,   ///< listing a directory
     ModuleLoad,      ///< loading a shared module
     SymbolLookup,    ///< looking up a symbol of a loaded module
+    Allocate,        ///< allocating or growing a block of the C run-time heap
     TemporaryFile,   ///< creating a new temporary file
 };
 inline constexpr int kFaultKindCount = static_cast<int>(FaultKind::TemporaryFile) + 1;

@@ -60,6 +60,7 @@ inline constexpr FaultKind kAllFaultKinds[] = {
     FaultKind::DirectoryList,
     FaultKind::ModuleLoad,
     FaultKind::SymbolLookup,
+    FaultKind::Allocate,
     FaultKind::TemporaryFile,
 };
 static_assert(std::size(kAllFaultKinds) == platform::kFaultKindCount);
