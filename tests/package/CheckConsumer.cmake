@@ -28,7 +28,7 @@ run(${CMAKE_COMMAND} --install ${BUILD_DIR} --prefix ${prefix})
 
 foreach(file include/tekit/tekit.h include/tekit/Export.h ${LIBDIR}/cmake/tekit/tekitConfig.cmake
              ${LIBDIR}/cmake/tekit/tekitConfigVersion.cmake ${LIBDIR}/cmake/tekit/tekitTargets.cmake
-             ${LIBDIR}/pkgconfig/tekit.pc)
+             ${LIBDIR}/pkgconfig/tekit.pc ${LIBDIR}/libkazlibwapi.so)
   if(NOT EXISTS ${prefix}/${file})
     message(SEND_ERROR "not installed: ${file}")
   endif()

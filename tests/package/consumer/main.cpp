@@ -40,6 +40,18 @@ int main() {
         Check(e.GetErrorCode() == TE_DISK_FULL, "the caught exception carries TE_DISK_FULL");
     }
 
+    // Compression loads its zlib module from beside the installed library.
+    try {
+        KaCompressor compressor;
+        DynamicString text, back;
+        compressor.StringToCompressedString(DynamicString("installed compression"), text);
+        Check(KaCompressor::IsCompressedBinaryString(text), "the compressed string is recognised");
+        compressor.CompressedStringToString(text, back);
+        Check(back == "installed compression", "a compressed string comes back unchanged");
+    } catch (TEException const& e) {
+        Check(false, e.GetDescription());
+    }
+
     if (failures == 0)
         std::puts("consumer: ok");
     return failures == 0 ? 0 : 1;
