@@ -5,6 +5,8 @@
 #   i686    configure, build, check the export table on the host: these machines run no
 #           32-bit program, so the 64-bit leg stands in for running the Win32 code
 #
+# Both export checks read the DLLs with the host's tekit program, built first (build/dev).
+#
 # TEKIT_SKIP_WINDOWS=1 skips both legs. Extra arguments are passed to ctest of the x86_64 leg.
 # Called by scripts/test.sh; runs on its own as well.
 set -euo pipefail
@@ -40,9 +42,16 @@ timed() {
     return $status
 }
 
+# The host's tekit program (of the dev build) reads the DLLs' export tables for the export
+# check: the library checks itself, without binutils.
+host_tool="$root/build/dev/tools/tekit/tekit"
+build_host_tool() {
+    cmake --preset dev >/dev/null && cmake --build --preset dev --target tekit_cli -j "$jobs"
+}
+
 build() {
     local preset=$1
-    cmake --preset "$preset" -DTEKIT_WERROR=ON >/dev/null &&
+    cmake --preset "$preset" -DTEKIT_WERROR=ON -DTEKIT_HOST_TOOL="$host_tool" >/dev/null &&
         cmake --build --preset "$preset" -j "$jobs"
 }
 
@@ -92,6 +101,7 @@ leg_i686() {
 
 require
 status=0
+timed "host tool" build_host_tool || exit 1
 timed "x86_64 leg" leg_x86_64 "$@" || status=1
 timed "i686 leg" leg_i686 || status=1
 exit $status

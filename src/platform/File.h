@@ -68,6 +68,12 @@ SystemError OpenFileForReading(char const* path, NativeFile& file);
 SystemError CreateTemporaryFile(char const* path, NativeFile& file);
 /// Reads up to `size` bytes; `count` 0 is the end of the file.
 SystemError ReadFromFile(NativeFile file, void* buffer, std::size_t size, std::size_t& count);
+/// Reads up to `size` bytes at `offset` without moving the file's position (pread,
+/// ReadFile with an offset); `count` below `size` only at the end of the file.
+SystemError ReadFromFileAt(NativeFile file, std::uint64_t offset, void* buffer, std::size_t size,
+                           std::size_t& count);
+/// The size in bytes of the open file.
+SystemError OpenFileSize(NativeFile file, std::uint64_t& size);
 /// Writes all `size` bytes.
 SystemError WriteToFile(NativeFile file, void const* data, std::size_t size);
 /// Makes what was written durable: fsync, FlushFileBuffers.

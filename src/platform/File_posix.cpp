@@ -225,6 +225,36 @@ SystemError ReadFromFile(NativeFile file, void* buffer, std::size_t size, std::s
     }
 }
 
+SystemError ReadFromFileAt(NativeFile file, std::uint64_t offset, void* buffer, std::size_t size,
+                           std::size_t& count) {
+    if (SystemError const injected = InjectedFailure(FaultKind::Read, "pread"))
+        return injected;
+    count = 0;
+    while (count < size) {
+        ssize_t const got = ::pread(Descriptor(file), static_cast<char*>(buffer) + count,
+                                    size - count, static_cast<off_t>(offset + count));
+        if (got == 0)
+            break;
+        if (got < 0) {
+            if (errno == EINTR)
+                continue;
+            return Errno("pread");
+        }
+        count += static_cast<std::size_t>(got);
+    }
+    return {};
+}
+
+SystemError OpenFileSize(NativeFile file, std::uint64_t& size) {
+    if (SystemError const injected = InjectedFailure(FaultKind::Stat, "fstat"))
+        return injected;
+    struct stat info {};
+    if (::fstat(Descriptor(file), &info) != 0)
+        return Errno("fstat");
+    size = static_cast<std::uint64_t>(info.st_size);
+    return {};
+}
+
 SystemError WriteToFile(NativeFile file, void const* data, std::size_t size) {
     if (SystemError const injected = InjectedFailure(FaultKind::Write, "write"))
         return injected;

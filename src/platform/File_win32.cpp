@@ -210,6 +210,41 @@ SystemError ReadFromFile(NativeFile file, void* buffer, std::size_t size, std::s
     return {};
 }
 
+SystemError ReadFromFileAt(NativeFile file, std::uint64_t offset, void* buffer, std::size_t size,
+                           std::size_t& count) {
+    if (SystemError const injected = InjectedFailure(FaultKind::Read, "ReadFile"))
+        return injected;
+    count = 0;
+    while (count < size) {
+        OVERLAPPED at{};
+        std::uint64_t const position = offset + count;
+        at.Offset = static_cast<DWORD>(position);
+        at.OffsetHigh = static_cast<DWORD>(position >> 32);
+        std::size_t const left = size - count;
+        DWORD const wanted = left > MAXDWORD ? MAXDWORD : static_cast<DWORD>(left);
+        DWORD got = 0;
+        if (!::ReadFile(Handle(file), static_cast<char*>(buffer) + count, wanted, &got, &at)) {
+            if (::GetLastError() == ERROR_HANDLE_EOF)
+                break;
+            return LastError("ReadFile");
+        }
+        if (got == 0)
+            break;
+        count += got;
+    }
+    return {};
+}
+
+SystemError OpenFileSize(NativeFile file, std::uint64_t& size) {
+    if (SystemError const injected = InjectedFailure(FaultKind::Stat, "GetFileSizeEx"))
+        return injected;
+    LARGE_INTEGER value{};
+    if (!::GetFileSizeEx(Handle(file), &value))
+        return LastError("GetFileSizeEx");
+    size = static_cast<std::uint64_t>(value.QuadPart);
+    return {};
+}
+
 SystemError WriteToFile(NativeFile file, void const* data, std::size_t size) {
     if (SystemError const injected = InjectedFailure(FaultKind::Write, "WriteFile"))
         return injected;

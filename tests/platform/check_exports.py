@@ -9,10 +9,15 @@ The flat exports are those that are not C++ symbols (mangled "_Z..."). The check
     function the list does not hold (the Linux version script would hide it);
   - a class named with --class has no C++ export.
 
-  check_exports.py --library tekit.dll --tool x86_64-w64-mingw32-objdump --format pe \
+  check_exports.py --library tekit.dll --tool build/dev/tools/tekit/tekit --format tekit \
                    --exports src/tekit.exports --include include --class DynamicString
+
+The export table of a DLL is read by the library itself, through the host's `tekit exe
+--exports --json` (--format tekit), or by binutils' objdump (--format pe); that of a shared
+object by nm (--format elf).
 """
 import argparse
+import json
 import pathlib
 import re
 import subprocess
@@ -137,6 +142,11 @@ def flat_declarations(header_text):
 
 
 def exported_names(tool, library, fmt):
+    if fmt == "tekit":
+        dump = subprocess.run([tool, "exe", "--exports", "--json", library], check=True,
+                              capture_output=True, text=True)
+        return {f["name"] for f in json.loads(dump.stdout)[0]["exports"]["functions"]
+                if f["name"]}
     if fmt == "pe":
         dump = subprocess.run([tool, "-p", library], check=True, capture_output=True, text=True)
         table = dump.stdout.split("[Ordinal/Name Pointer] Table", 1)
@@ -187,8 +197,9 @@ def compare(listed, exports, fmt):
 def main():
     parser = argparse.ArgumentParser()
     parser.add_argument("--library", required=True)
-    parser.add_argument("--tool", required=True, help="objdump for PE, nm for ELF")
-    parser.add_argument("--format", choices=["pe", "elf"], required=True)
+    parser.add_argument("--tool", required=True,
+                        help="the host's tekit program for tekit, objdump for PE, nm for ELF")
+    parser.add_argument("--format", choices=["tekit", "pe", "elf"], required=True)
     parser.add_argument("--exports", required=True, help="the export list")
     parser.add_argument("--include", help="public headers whose flat declarations must be listed")
     parser.add_argument("--class", dest="classes", action="append", default=[])
