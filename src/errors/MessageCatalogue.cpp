@@ -32,6 +32,11 @@ constexpr MessageRow kToolErrors[] = {
 #include "tekit/errors/RegExprStatus.def"
     {"REGEXPR_UnknownError", "Unknown Error"},
 };
+/// "INI_ERRORS": the INI store's status codes under their keys.
+constexpr MessageRow kIniErrors[] = {
+#define INI_STATUS(symbol, value, key, text) TEKIT_STATUS_MESSAGE(key, text)
+#include "tekit/errors/IniStatus.def"
+};
 
 template <int N> constexpr MessageSection Section(char const* name, MessageRow const (&rows)[N]) {
     return {name, rows, N};
@@ -42,6 +47,7 @@ constexpr MessageSection kSections[] = {
     Section("TE_ERRORS", kTEErrors),
     Section("ERR_DESCR", kErrDescr),
     Section("CRX_TOOLERR", kToolErrors), // the toolbox's pattern engine
+    Section("INI_ERRORS", kIniErrors),   // the INI store
     {nullptr, nullptr, 0},
 };
 
