@@ -17,10 +17,12 @@ fi
 
 scripts/install-deps.sh --linux >&2
 # The peers of the comparisons, installed here only, never by the test command: Qt 5 Core
-# (QString, bench_strings), RE2 and PCRE2 (bench_patterns), POCO (bench_sync). A program
-# whose peer is missing leaves that column out.
+# (QString, bench_strings), RE2 and PCRE2 (bench_patterns), POCO (bench_sync, bench_ini), cereal
+# (bench_streams), inih and SimpleIni (bench_ini). A program whose peer is missing leaves that
+# column out.
 peers=()
-for package in qtbase5-dev libre2-dev libpcre2-dev libpoco-dev; do
+for package in qtbase5-dev libre2-dev libpcre2-dev libpoco-dev libcereal-dev \
+    libinih-dev libsimpleini-dev; do
     dpkg-query -W -f='${Status}' "$package" 2>/dev/null | grep -q "install ok installed" ||
         peers+=("$package")
 done
@@ -42,4 +44,9 @@ for program in $(find build/release/bench -type f -name 'bench_*' -perm -u+x | s
     echo "==== $name"
     "$program" "$@" || status=1
 done
+# The reader of Windows executables against binutils, whole processes on tekit.dll.
+if [[ -z "$filter" || exe_vs_objdump == *"$filter"* ]]; then
+    echo "==== exe_vs_objdump"
+    bench/exe_vs_objdump.sh build/release/tools/tekit/tekit || status=1
+fi
 exit $status

@@ -14,6 +14,9 @@ A case file reads like a terminal session. Each case is:
     2> tekit: 1 of 2 paths is not valid    expected standard error, line by line
     [exit 1]                              the exit status; ends the case
 
+The cases of a file run in order, in an empty temporary directory of their own, so a case
+may write a file that later cases read. The files of the directory named by the environment
+variable TEKIT_CASE_FILES, when set, are copied into it first.
 Between cases, blank lines and lines starting with "#" are comments. A line
 "[not on windows: <reason>]" before a case skips it on the Windows leg, saying why.
 Output of a case run with --json must parse as JSON. A mismatch prints a diff; the script
@@ -21,9 +24,12 @@ exits 1 when any case failed.
 """
 import difflib
 import json
+import os
 import re
+import shutil
 import subprocess
 import sys
+import tempfile
 
 ESCAPES = {"t": "\t", "n": "\n", "r": "\r", "\\": "\\", "'": "'", "0": "\0"}
 
@@ -113,18 +119,18 @@ def parse(path):
     return cases
 
 
-def run(case, program, windows):
+def run(case, program, windows, directory):
     words = split_words(case.command)
     if not words or words[0] != "tekit":
         sys.exit(f"line {case.line_number}: a command starts with 'tekit'")
     stdout_file = None
     if len(words) >= 3 and words[-2] == ">":
-        stdout_file = open(words[-1], "wb")
+        stdout_file = open(os.path.join(directory, words[-1]), "wb")
         words = words[:-2]
     try:
         result = subprocess.run(program + words[1:], input="".join(case.stdin).encode("utf-8", "surrogateescape"),
                                 stdout=stdout_file or subprocess.PIPE,
-                                stderr=subprocess.PIPE, timeout=300)
+                                stderr=subprocess.PIPE, timeout=300, cwd=directory)
     finally:
         if stdout_file:
             stdout_file.close()
@@ -163,12 +169,19 @@ def main():
     if windows:
         args = args[1:]
     case_file, program = args[0], args[2:]
+    # The cases run in a directory of their own: a program given by a relative path is found
+    # from here.
+    program = [os.path.abspath(word) if os.path.exists(word) else word for word in program]
     failed = 0
+    directory = tempfile.TemporaryDirectory(prefix="tekit-tool-case-")
+    # Files the cases read (sample executables, ...), copied in before the first case.
+    if os.environ.get("TEKIT_CASE_FILES"):
+        shutil.copytree(os.environ["TEKIT_CASE_FILES"], directory.name, dirs_exist_ok=True)
     for case in parse(case_file):
         if windows and case.skip:
             print(f"{case_file}:{case.line_number}: skipped on the Windows leg: {case.skip}")
             continue
-        problems = check(case, *run(case, program, windows))
+        problems = check(case, *run(case, program, windows, directory.name))
         if problems:
             failed += 1
             print(f"{case_file}:{case.line_number}: $ {case.command}")

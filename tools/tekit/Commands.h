@@ -57,6 +57,10 @@ std::vector<Command> const& PathCommands();
 std::vector<Command> const& RangeCommands();
 std::vector<Command> const& VersionCommands();
 std::vector<Command> const& GrepCommands();
+std::vector<Command> const& ExeCommands();
+std::vector<Command> const& EnvCommands();
+std::vector<Command> const& IniCommands();
+std::vector<Command> const& CompressCommands();
 
 /// A word that gathers commands ("path" for "path check", ...): its own help.
 struct CommandGroup {
@@ -66,5 +70,6 @@ struct CommandGroup {
 };
 CommandGroup const& PathGroup();
 CommandGroup const& VersionGroup();
+CommandGroup const& IniGroup();
 
 } // namespace tekit::tool

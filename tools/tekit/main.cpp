@@ -51,7 +51,9 @@ std::vector<Command> const& AllCommands() {
     static std::vector<Command> const commands = [] {
         std::vector<Command> all;
         for (auto const* list : {&DemoCommands(), &ErrorCommands(), &PathCommands(),
-                                 &RangeCommands(), &VersionCommands(), &GrepCommands()})
+                                 &RangeCommands(), &VersionCommands(), &GrepCommands(),
+                                 &IniCommands(), &ExeCommands(), &EnvCommands(),
+                                 &CompressCommands()})
             all.insert(all.end(), list->begin(), list->end());
         return all;
     }();
@@ -59,7 +61,8 @@ std::vector<Command> const& AllCommands() {
 }
 
 std::vector<CommandGroup const*> const& AllGroups() {
-    static std::vector<CommandGroup const*> const groups{&PathGroup(), &VersionGroup()};
+    static std::vector<CommandGroup const*> const groups{&PathGroup(), &VersionGroup(),
+                                                         &IniGroup()};
     return groups;
 }
 
