@@ -63,13 +63,12 @@ protected:
 };
 
 TEST_F(IniFile, BadBytesReadAsDocumented) {
-    struct Case {
+    std::string const longValue(700, 'v');
+    struct {
         char const* name;
         std::string bytes;
         char const* dump;
-    };
-    std::string const longValue(700, 'v');
-    Case const cases[] = {
+    } const cases[] = {
         {"LongLineIsCutAt640Bytes", "[s]\nK=" + longValue + "\nL=1",
          nullptr}, // checked below: K holds 638 bytes
         {"NulEndsALine", std::string("[s]\nK=a\0L=b\n", 12), "[s]\nK=a\nL=b\n"},
@@ -79,7 +78,7 @@ TEST_F(IniFile, BadBytesReadAsDocumented) {
         {"LineNumbersCountEmptyLines", "; x\r\n\r\n[s]\r\n\r\n\r\nA=1\r\n", "[s]@3\nA=1@6\n"},
         {"Empty", "", ""},
     };
-    for (Case const& c : cases) {
+    for (auto const& c : cases) {
         SCOPED_TRACE(c.name);
         WriteBytes(At("in.ini"), c.bytes);
         IniObject ini;

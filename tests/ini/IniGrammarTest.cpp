@@ -121,17 +121,10 @@ TEST(IniRead, SortingObjectSortsAfterEveryRead) {
 
 class IniMultiByteRead : public MultiByteFixture {};
 
-struct ByteModeCase {
-    char const* name;
-    char const* text;
-    char const* singleByte; ///< Dump() with multibyte mode off
-    char const* shiftJis;   ///< Dump() with Shift-JIS lead bytes on
-};
-
 // 0x82 leads a double-byte character in Shift-JIS: the byte after it is its trail byte,
-// whatever it is.
+// whatever it is. Each case gives the object read with multibyte mode off, then on.
 // clang-format off
-ByteModeCase const kByteModes[] = {
+struct { char const* name; char const* text; char const* singleByte, *shiftJis; } const kByteModes[] = {
     {"TrailByteIsNoClosingBracket", "[a\x82]\nK=v", "[a\x82]\nK=v\n", ""},
     {"TrailByteIsNoWhiteSpace", "[s]\nK = a\x82 ", "[s]\nK=a\x82\n", "[s]\nK=a\x82 \n"},
     {"TrailByteIsNoClosingQuote", "[s]\nK = \"a\x82\"", "[s]\nK=\"a\x82\n", "[s]\nK=\"a\x82\"\n"},
@@ -142,7 +135,7 @@ ByteModeCase const kByteModes[] = {
 // clang-format on
 
 TEST_F(IniMultiByteRead, TrailBytesAreNeverTokens) {
-    for (ByteModeCase const& c : kByteModes) {
+    for (auto const& c : kByteModes) {
         SCOPED_TRACE(c.name);
         String::EnableMultiByteSupport(false);
         IniObject single;
