@@ -101,6 +101,20 @@ struct Cursor {
     }
 };
 
+/// A number after its leading white space: where it begins, whether its sign is '-', and where
+/// its digits begin (past a '-' or '+').
+struct SignedNumber {
+    char const* begin;
+    bool negative;
+    char const* digits;
+};
+
+SignedNumber ReadSign(Cursor const& cursor) {
+    char const* const begin = cursor.SkipSpace(cursor.begin);
+    bool const sign = begin < cursor.end && (*begin == '-' || *begin == '+');
+    return {begin, sign && *begin == '-', begin + (sign ? 1 : 0)};
+}
+
 bool IsDigitOf(char c, int radix) {
     int const digit = (c >= '0' && c <= '9')   ? c - '0'
                       : (c >= 'a' && c <= 'z') ? c - 'a' + 10
@@ -131,12 +145,8 @@ T ReadInteger(String const& s, int startIndex, int* endIndex, int radix, NumberT
                       size_t(text.GetNumBytes()), type.function);
     }
     Cursor const cursor(s, startIndex);
-    char const* const numberBegin = cursor.SkipSpace(cursor.begin);
-    char const* p = numberBegin;
-    bool const negative = p < cursor.end && *p == '-';
-    if (p < cursor.end && (*p == '-' || *p == '+'))
-        ++p;
-    p = ResolveRadix(p, cursor.end, radix);
+    auto const [numberBegin, negative, digits] = ReadSign(cursor);
+    char const* const p = ResolveRadix(digits, cursor.end, radix);
     std::uint64_t magnitude = 0;
     auto const [digitsEnd, error] = std::from_chars(p, cursor.end, magnitude, radix);
     if (digitsEnd == p)
@@ -212,11 +222,7 @@ bool IsTooLarge(char const* p, char const* end, bool hex) {
 double ReadFloat(String const& s, int startIndex, int* endIndex,
                  kDecimalPointLocalizationOptions options) {
     Cursor const cursor(s, startIndex);
-    char const* const numberBegin = cursor.SkipSpace(cursor.begin);
-    char const* p = numberBegin;
-    bool const negative = p < cursor.end && *p == '-';
-    if (p < cursor.end && (*p == '-' || *p == '+'))
-        ++p;
+    auto const [numberBegin, negative, p] = ReadSign(cursor);
     std::string const text = WithPeriod(p, cursor.end, String::GetLocalizedDecimalPoint(options));
     char const* const first = text.c_str();
     char const* const last = first + text.size();
@@ -242,83 +248,44 @@ double ReadFloat(String const& s, int startIndex, int* endIndex,
     return negative ? -magnitude : magnitude;
 }
 
+/// The readers whose errors name them rather than the reader of their width.
+constexpr NumberType kSizeT = Renamed(TypeOf<std::size_t>(), "String::CvtToSizeT");
+constexpr NumberType kSignedSizeT = Renamed(TypeOf<std::ptrdiff_t>(), "String::CvtToSignedSizeT");
+constexpr NumberType kInt32WithRadix = Renamed(kInt32, "String::CvtToInt32WithRadix");
+constexpr NumberType kUInt32WithRadix = Renamed(kUInt32, "String::CvtToUInt32WithRadix");
+
 } // namespace
 
 // ---- Integers ------------------------------------------------------------------------------
 
-std::int32_t String::CvtToInt32(int startIndex) const {
-    return ReadInteger<std::int32_t>(*this, startIndex, nullptr, 10, kInt32);
-}
+// Each reader comes in a form without and one with the end index, both reading through
+// ReadInteger with the limits and the function name of `type`; the decimal ones fix the radix.
+#define TEKIT_INTEGER_READERS(T, name, type)                                                       \
+    T String::name(int startIndex) const {                                                         \
+        return ReadInteger<T>(*this, startIndex, nullptr, 10, type);                               \
+    }                                                                                              \
+    T String::name(int startIndex, int& endIndex) const {                                          \
+        return ReadInteger<T>(*this, startIndex, &endIndex, 10, type);                             \
+    }
+#define TEKIT_RADIX_READERS(T, name, type)                                                         \
+    T String::name(int radix, int startIndex) const {                                              \
+        return ReadInteger<T>(*this, startIndex, nullptr, radix, type);                            \
+    }                                                                                              \
+    T String::name(int radix, int startIndex, int& endIndex) const {                               \
+        return ReadInteger<T>(*this, startIndex, &endIndex, radix, type);                          \
+    }
 
-std::int32_t String::CvtToInt32(int startIndex, int& endIndex) const {
-    return ReadInteger<std::int32_t>(*this, startIndex, &endIndex, 10, kInt32);
-}
+TEKIT_INTEGER_READERS(std::int32_t, CvtToInt32, kInt32)
+TEKIT_INTEGER_READERS(std::uint32_t, CvtToUInt32, kUInt32)
+TEKIT_INTEGER_READERS(std::int64_t, CvtToInt64, kInt64)
+TEKIT_INTEGER_READERS(std::uint64_t, CvtToUInt64, kUInt64)
+TEKIT_INTEGER_READERS(std::size_t, CvtToSizeT, kSizeT)
+TEKIT_INTEGER_READERS(std::ptrdiff_t, CvtToSignedSizeT, kSignedSizeT)
+TEKIT_RADIX_READERS(std::int32_t, CvtToInt32WithRadix, kInt32WithRadix)
+TEKIT_RADIX_READERS(std::uint32_t, CvtToUInt32WithRadix, kUInt32WithRadix)
 
-std::uint32_t String::CvtToUInt32(int startIndex) const {
-    return ReadInteger<std::uint32_t>(*this, startIndex, nullptr, 10, kUInt32);
-}
-
-std::uint32_t String::CvtToUInt32(int startIndex, int& endIndex) const {
-    return ReadInteger<std::uint32_t>(*this, startIndex, &endIndex, 10, kUInt32);
-}
-
-std::int64_t String::CvtToInt64(int startIndex) const {
-    return ReadInteger<std::int64_t>(*this, startIndex, nullptr, 10, kInt64);
-}
-
-std::int64_t String::CvtToInt64(int startIndex, int& endIndex) const {
-    return ReadInteger<std::int64_t>(*this, startIndex, &endIndex, 10, kInt64);
-}
-
-std::uint64_t String::CvtToUInt64(int startIndex) const {
-    return ReadInteger<std::uint64_t>(*this, startIndex, nullptr, 10, kUInt64);
-}
-
-std::uint64_t String::CvtToUInt64(int startIndex, int& endIndex) const {
-    return ReadInteger<std::uint64_t>(*this, startIndex, &endIndex, 10, kUInt64);
-}
-
-std::size_t String::CvtToSizeT(int startIndex) const {
-    static constexpr NumberType kType = Renamed(TypeOf<std::size_t>(), "String::CvtToSizeT");
-    return ReadInteger<std::size_t>(*this, startIndex, nullptr, 10, kType);
-}
-
-std::size_t String::CvtToSizeT(int startIndex, int& endIndex) const {
-    static constexpr NumberType kType = Renamed(TypeOf<std::size_t>(), "String::CvtToSizeT");
-    return ReadInteger<std::size_t>(*this, startIndex, &endIndex, 10, kType);
-}
-
-std::ptrdiff_t String::CvtToSignedSizeT(int startIndex) const {
-    static constexpr NumberType kType =
-        Renamed(TypeOf<std::ptrdiff_t>(), "String::CvtToSignedSizeT");
-    return ReadInteger<std::ptrdiff_t>(*this, startIndex, nullptr, 10, kType);
-}
-
-std::ptrdiff_t String::CvtToSignedSizeT(int startIndex, int& endIndex) const {
-    static constexpr NumberType kType =
-        Renamed(TypeOf<std::ptrdiff_t>(), "String::CvtToSignedSizeT");
-    return ReadInteger<std::ptrdiff_t>(*this, startIndex, &endIndex, 10, kType);
-}
-
-std::int32_t String::CvtToInt32WithRadix(int radix, int startIndex) const {
-    static constexpr NumberType kType = Renamed(kInt32, "String::CvtToInt32WithRadix");
-    return ReadInteger<std::int32_t>(*this, startIndex, nullptr, radix, kType);
-}
-
-std::int32_t String::CvtToInt32WithRadix(int radix, int startIndex, int& endIndex) const {
-    static constexpr NumberType kType = Renamed(kInt32, "String::CvtToInt32WithRadix");
-    return ReadInteger<std::int32_t>(*this, startIndex, &endIndex, radix, kType);
-}
-
-std::uint32_t String::CvtToUInt32WithRadix(int radix, int startIndex) const {
-    static constexpr NumberType kType = Renamed(kUInt32, "String::CvtToUInt32WithRadix");
-    return ReadInteger<std::uint32_t>(*this, startIndex, nullptr, radix, kType);
-}
-
-std::uint32_t String::CvtToUInt32WithRadix(int radix, int startIndex, int& endIndex) const {
-    static constexpr NumberType kType = Renamed(kUInt32, "String::CvtToUInt32WithRadix");
-    return ReadInteger<std::uint32_t>(*this, startIndex, &endIndex, radix, kType);
-}
+#undef TEKIT_INTEGER_READERS
+#undef TEKIT_RADIX_READERS
 
 // ---- Floating point ------------------------------------------------------------------------
 

@@ -105,15 +105,20 @@ bool IsCharBoundary(char const* text, char const* p, bool mb) {
     return !mb || p == text || mbcs::Inc(mbcs::Dec(text, p)) == p;
 }
 
+/// False for a character no text holds: NUL, and above 0xFF in single-byte mode.
+bool CanOccur(unsigned short ch, bool mb) {
+    return ch != 0 && (mb || ch <= 0xFF);
+}
+
 } // namespace
 
 int String::FindChar(unsigned short ch, int startIndex) const {
     bool const mb = m_isMultiByteSupportEnabled;
-    char const* text = detail::ReadPtr(*this);
-    int const numBytes = GetNumBytes();
-    if (ch == 0 || (!mb && ch > 0xFF))
+    if (!CanOccur(ch, mb))
         return -1;
+    char const* text = detail::ReadPtr(*this);
     if (!mb) {
+        int const numBytes = GetNumBytes();
         int const from = std::clamp(startIndex, 0, numBytes);
         void const* hit = std::memchr(text + from, ch, size_t(numBytes - from));
         return hit ? static_cast<int>(static_cast<char const*>(hit) - text) : -1;
@@ -127,11 +132,11 @@ int String::FindChar(unsigned short ch, int startIndex) const {
 
 int String::FindCharReverse(unsigned short ch, int startIndex) const {
     bool const mb = m_isMultiByteSupportEnabled;
-    char const* text = detail::ReadPtr(*this);
-    int const numBytes = GetNumBytes();
-    if (ch == 0 || (!mb && ch > 0xFF))
+    if (!CanOccur(ch, mb))
         return -1;
+    char const* text = detail::ReadPtr(*this);
     if (!mb) {
+        int const numBytes = GetNumBytes();
         int i = (startIndex < 0 || startIndex >= numBytes) ? numBytes - 1 : startIndex;
         for (; i >= 0; --i)
             if (static_cast<unsigned char>(text[i]) == ch)

@@ -34,10 +34,6 @@ namespace {
 
 constexpr double kRadiansPerDegree = 0.017453292519943295;
 constexpr double kDegreesPerRadian = 57.29577951308232;
-constexpr double kFeetPerMeter = 3.2808399;
-constexpr double kMilesPerKilometer = 0.62137119;
-constexpr double kPoundsPerKilogram = 2.2046226;
-constexpr double kGallonsPerLiter = 0.26417205;
 constexpr double kKelvinOffset = 273.15;
 
 } // namespace
@@ -60,27 +56,19 @@ extern "C" double TEKIT_STDCALL CelsiusToKelvin(double x) {
 extern "C" double TEKIT_STDCALL KelvinToCelsius(double x) {
     return x - kKelvinOffset;
 }
-extern "C" double TEKIT_STDCALL MetersToFeet(double x) {
-    return x * kFeetPerMeter;
-}
-extern "C" double TEKIT_STDCALL FeetToMeters(double x) {
-    return x / kFeetPerMeter;
-}
-extern "C" double TEKIT_STDCALL KilometersToMiles(double x) {
-    return x * kMilesPerKilometer;
-}
-extern "C" double TEKIT_STDCALL MilesToKilometers(double x) {
-    return x / kMilesPerKilometer;
-}
-extern "C" double TEKIT_STDCALL KilogramsToPounds(double x) {
-    return x * kPoundsPerKilogram;
-}
-extern "C" double TEKIT_STDCALL PoundsToKilograms(double x) {
-    return x / kPoundsPerKilogram;
-}
-extern "C" double TEKIT_STDCALL LitersToGallons(double x) {
-    return x * kGallonsPerLiter;
-}
-extern "C" double TEKIT_STDCALL GallonsToLiters(double x) {
-    return x / kGallonsPerLiter;
-}
+
+/// A pair of conversions over one factor: `toUnit` multiplies by it, `fromUnit` divides.
+#define TEKIT_CONVERSION_PAIR(toUnit, fromUnit, factor)                                            \
+    extern "C" double TEKIT_STDCALL toUnit(double x) {                                             \
+        return x * (factor);                                                                       \
+    }                                                                                              \
+    extern "C" double TEKIT_STDCALL fromUnit(double x) {                                           \
+        return x / (factor);                                                                       \
+    }
+
+TEKIT_CONVERSION_PAIR(MetersToFeet, FeetToMeters, 3.2808399)
+TEKIT_CONVERSION_PAIR(KilometersToMiles, MilesToKilometers, 0.62137119)
+TEKIT_CONVERSION_PAIR(KilogramsToPounds, PoundsToKilograms, 2.2046226)
+TEKIT_CONVERSION_PAIR(LitersToGallons, GallonsToLiters, 0.26417205)
+
+#undef TEKIT_CONVERSION_PAIR

@@ -17,17 +17,20 @@ namespace tekit::toolbox {
 
 namespace {
 
-int WriteFixed(char const* text, int length, char* buffer, int bufferSize) {
+bool InRange(int value, int low, int high) {
+    return value >= low && value <= high;
+}
+
+/// Writes three numbers in `format`, a text of exactly `length` characters, to `buffer`.
+int WriteFixed(char const* format, int length, int a, int b, int c, char* buffer, int bufferSize) {
     if (!buffer)
         return TE_INVALID_POINTER;
     if (bufferSize <= length)
         return TE_INVALID_OR_OUT_OF_RANGE;
+    char text[16];
+    std::snprintf(text, sizeof text, format, a, b, c);
     std::memcpy(buffer, text, static_cast<std::size_t>(length) + 1);
     return length;
-}
-
-bool InRange(int value, int low, int high) {
-    return value >= low && value <= high;
 }
 
 } // namespace
@@ -35,17 +38,13 @@ bool InRange(int value, int low, int high) {
 int FormatInternationalDate(platform::LocalDateTime const& when, char* buffer, int bufferSize) {
     if (!InRange(when.year, 0, 9999) || !InRange(when.month, 1, 12) || !InRange(when.day, 1, 31))
         return TE_INVALID_OR_OUT_OF_RANGE;
-    char text[16];
-    std::snprintf(text, sizeof text, "%04d-%02d-%02d", when.year, when.month, when.day);
-    return WriteFixed(text, 10, buffer, bufferSize);
+    return WriteFixed("%04d-%02d-%02d", 10, when.year, when.month, when.day, buffer, bufferSize);
 }
 
 int FormatInternationalTime(platform::LocalDateTime const& when, char* buffer, int bufferSize) {
     if (!InRange(when.hour, 0, 23) || !InRange(when.minute, 0, 59) || !InRange(when.second, 0, 60))
         return TE_INVALID_OR_OUT_OF_RANGE;
-    char text[16];
-    std::snprintf(text, sizeof text, "%02d:%02d:%02d", when.hour, when.minute, when.second);
-    return WriteFixed(text, 8, buffer, bufferSize);
+    return WriteFixed("%02d:%02d:%02d", 8, when.hour, when.minute, when.second, buffer, bufferSize);
 }
 
 } // namespace tekit::toolbox

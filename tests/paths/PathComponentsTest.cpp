@@ -144,23 +144,18 @@ TEST(PathComponents, AppendAddsOneSeparatorUnlessTheEndHasOne) {
 }
 
 TEST(PathComponents, RemovingComponentsNeverCutsIntoTheRoot) {
-    Path path("C:\\a\\b.txt");
-    path.RemoveFileComponent();
-    path.RemoveFileComponent();
-    path.RemoveFileComponent();
-    EXPECT_STREQ(path.CStr(), "C:\\");
-
-    Path directory("C:\\a\\b\\");
-    directory.RemoveFileComponent();
-    EXPECT_STREQ(directory.CStr(), "C:\\a\\b\\");
-    directory.RemoveLastComponent();
-    EXPECT_STREQ(directory.CStr(), "C:\\a");
-    directory.RemoveLastComponent();
-    directory.RemoveLastComponent();
-    EXPECT_STREQ(directory.CStr(), "C:\\");
-    Path share("\\\\srv\\share\\d");
-    share.RemoveLastComponent();
-    EXPECT_STREQ(share.CStr(), "\\\\srv\\share");
+    // Each step removes the file component ('f') or the last component ('l').
+    auto removed = [](char const* text, std::string const& steps) {
+        Path path(text);
+        for (char step : steps)
+            step == 'f' ? path.RemoveFileComponent() : path.RemoveLastComponent();
+        return std::string(path.CStr());
+    };
+    EXPECT_EQ(removed("C:\\a\\b.txt", "fff"), "C:\\");
+    EXPECT_EQ(removed("C:\\a\\b\\", "f"), "C:\\a\\b\\");
+    EXPECT_EQ(removed("C:\\a\\b\\", "fl"), "C:\\a");
+    EXPECT_EQ(removed("C:\\a\\b\\", "flll"), "C:\\");
+    EXPECT_EQ(removed("\\\\srv\\share\\d", "l"), "\\\\srv\\share");
 }
 
 TEST(PathComponents, TrailingSeparatorsAreStrippedExceptFromRoots) {

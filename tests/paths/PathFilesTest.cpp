@@ -11,9 +11,9 @@
 #include <random>
 #include <sstream>
 #include <string>
+#include <tuple>
 
 using namespace tekit;
-using tekit::testing::Caught;
 using tekit::testing::FaultKind;
 using tekit::testing::Raised;
 using tekit::testing::ScopedFault;
@@ -84,7 +84,7 @@ TEST_F(PathFiles, ExistenceSizeAndDirectories) {
 
     DynamicPath missing = P("missing.txt");
     EXPECT_FALSE(missing.Exists());
-    TEException const e = Caught([&] { missing.GetFileSize(); });
+    TEException const e = Raised([&] { missing.GetFileSize(); });
     EXPECT_EQ(e.GetErrorCode(), TE_FILE_NOT_FOUND);
     EXPECT_EQ(std::string(e.GetDescription()),
               "Could not read the information of " + Q("missing.txt") + ". File not found.");
@@ -122,12 +122,12 @@ TEST_F(PathFiles, ReadOnlyFilesAreNeitherDeletedNorReplaced) {
     locked.SetReadOnly(true);
     EXPECT_TRUE(locked.IsReadOnly());
 
-    TEException e = Caught([&] { locked.Delete(); });
+    TEException e = Raised([&] { locked.Delete(); });
     EXPECT_EQ(e.GetErrorCode(), TE_ACCESS_DENIED);
     EXPECT_EQ(std::string(e.GetDescription()),
               "Could not delete " + Q("locked.txt") + ". Access denied.");
-    EXPECT_EQ(Caught([&] { other.CopyTo(locked, true); }).GetErrorCode(), TE_ACCESS_DENIED);
-    EXPECT_EQ(Caught([&] { other.MoveToReplacing(locked); }).GetErrorCode(), TE_ACCESS_DENIED);
+    EXPECT_EQ(Raised([&] { other.CopyTo(locked, true); }).GetErrorCode(), TE_ACCESS_DENIED);
+    EXPECT_EQ(Raised([&] { other.MoveToReplacing(locked); }).GetErrorCode(), TE_ACCESS_DENIED);
     EXPECT_EQ(Read("locked.txt"), "keep");
     EXPECT_EQ(Read("other.txt"), "new");
     EXPECT_EQ(NumEntries(), 2u); // no temporary copy left behind
@@ -147,7 +147,7 @@ TEST_F(PathFiles, CopyKeepsContentsAndRefusesToOverwriteUnlessAsked) {
     EXPECT_EQ(copy.GetFileTime(PathBase::kLastWriteTime), kSomeTime);
 
     Write("copy.bin", "older");
-    TEException const e = Caught([&] { source.CopyTo(copy, false); });
+    TEException const e = Raised([&] { source.CopyTo(copy, false); });
     EXPECT_EQ(e.GetErrorCode(), TE_FILE_ALREADY_EXISTS);
     EXPECT_EQ(std::string(e.GetDescription()), "Could not copy " + Q("source.bin") + " to " +
                                                    Q("copy.bin") + ". File already exists.");
@@ -156,10 +156,10 @@ TEST_F(PathFiles, CopyKeepsContentsAndRefusesToOverwriteUnlessAsked) {
 
 TEST_F(PathFiles, FailedCopiesLeaveNothingBehind) {
     DynamicPath target = P("target.txt");
-    TEException e = Caught([&] { P("missing.txt").CopyTo(target, true); });
+    TEException e = Raised([&] { P("missing.txt").CopyTo(target, true); });
     EXPECT_EQ(e.GetErrorCode(), TE_FILE_NOT_FOUND);
     fs::create_directory(At("folder"));
-    e = Caught([&] { P("folder").CopyTo(target, true); });
+    e = Raised([&] { P("folder").CopyTo(target, true); });
 #if defined(_WIN32)
     EXPECT_EQ(e.GetErrorCode(), TE_ACCESS_DENIED);
 #else
@@ -174,7 +174,7 @@ TEST_F(PathFiles, MoveRenamesAndRefusesAnExistingDestinationUnlessReplacing) {
     DynamicPath a = P("a.txt");
     DynamicPath b = P("b.txt");
     DynamicPath c = P("c.txt");
-    TEException const e = Caught([&] { a.MoveTo(b); });
+    TEException const e = Raised([&] { a.MoveTo(b); });
     EXPECT_EQ(e.GetErrorCode(), TE_FILE_ALREADY_EXISTS);
     EXPECT_EQ(std::string(e.GetDescription()),
               "Could not move " + Q("a.txt") + " to " + Q("b.txt") + ". File already exists.");
@@ -203,13 +203,13 @@ TEST_F(PathFiles, AllDirectoriesOfAPathAreMadeOrNoneAre) {
     Write("plain", "file");
     std::string const blocked = At("plain", "sub");
     TEException e =
-        Caught([&] { DynamicPath(blocked.c_str()).MakeAllDirectoriesInPathNameLong(); });
+        Raised([&] { DynamicPath(blocked.c_str()).MakeAllDirectoriesInPathNameLong(); });
     EXPECT_STREQ(e.GetFunctionName(), "PathBase::MakeAllDirectoriesInPathNameLong");
 
     // The third level cannot be made: the first two go again.
     std::string const tooLong =
         At(std::string("new1") + kHostSeparator + "new2" + kHostSeparator + std::string(300, 'x'));
-    e = Caught([&] { DynamicPath(tooLong.c_str()).MakeAllDirectoriesInPathNameLong(); });
+    e = Raised([&] { DynamicPath(tooLong.c_str()).MakeAllDirectoriesInPathNameLong(); });
     EXPECT_NE(e.GetErrorCode(), TE_NO_ERROR);
     EXPECT_FALSE(Has("new1"));
 }
@@ -230,7 +230,7 @@ TEST_F(PathFiles, WildcardListingFillsTheOrderedSet) {
     EXPECT_EQ(files.count(Path(At("d.txt").c_str())), 1u);
 
     TEException const e =
-        Caught([&] { DynamicPath(At("nowhere", "*").c_str()).FindFilesEx(files, false); });
+        Raised([&] { DynamicPath(At("nowhere", "*").c_str()).FindFilesEx(files, false); });
 #if defined(_WIN32)
     EXPECT_EQ(e.GetErrorCode(), TE_PATH_NOT_FOUND);
 #else
@@ -254,7 +254,7 @@ TEST_F(PathFiles, UniqueTemporaryFilesAreCreatedBesideTheTarget) {
     EXPECT_EQ(fs::path(third.CStr()).parent_path(), m_root);
 
     DynamicPath nowhere(At("missing", "x.ini").c_str());
-    EXPECT_NE(Caught([&] { nowhere.CreateUniqueTempFile("ini$$", third); }).GetErrorCode(),
+    EXPECT_NE(Raised([&] { nowhere.CreateUniqueTempFile("ini$$", third); }).GetErrorCode(),
               TE_NO_ERROR);
 }
 
@@ -279,35 +279,33 @@ TEST(PathProcess, CurrentDirectoryAndProgramFileExist) {
 
 // ---- Failures injected through the fault seam ---------------------------------------------
 
-TEST_F(PathFiles, FullDiskDuringACopyLeavesTheTargetAsItWas) {
+// A full disk while writing, or no temporary file to write to: the copy raises the injected
+// error and leaves the target as it was, with no temporary file behind.
+TEST_F(PathFiles, FailedCopyLeavesTheTargetAsItWas) {
     Write("source.txt", "new contents");
     DynamicPath const source = P("source.txt");
-    DynamicPath const target = P("target.txt");
-    std::string const description =
-        "Could not copy " + Q("source.txt") + " to " + Q("target.txt") + ". The disk is full.";
-    for (bool const targetExists : {false, true}) {
-        SCOPED_TRACE(targetExists ? "overwriting" : "new target");
-        if (targetExists)
-            Write("target.txt", "old contents");
-        size_t const entries = NumEntries();
-        ScopedFault const full(FaultKind::Write, 1, native::kDiskFull);
-        TEException const e = Raised([&] { source.CopyTo(target, true); });
-        EXPECT_EQ(e.GetErrorCode(), TE_DISK_FULL);
-        EXPECT_EQ(std::string(e.GetDescription()), description);
-        EXPECT_EQ(e.GetAPIErrorCode(), native::kDiskFull);
-        EXPECT_EQ(Has("target.txt") ? Read("target.txt") : "none",
-                  targetExists ? "old contents" : "none");
-        EXPECT_EQ(NumEntries(), entries); // no temporary file left behind
+    std::tuple<FaultKind, long, TEError, char const*> const faults[] = {
+        {FaultKind::Write, native::kDiskFull, TE_DISK_FULL, "The disk is full."},
+        {FaultKind::TemporaryFile, native::kAccessDenied, TE_ACCESS_DENIED, "Access denied."}};
+    for (auto const& [kind, code, error, reason] : faults) {
+        for (bool const targetExists : {false, true}) {
+            SCOPED_TRACE(::testing::Message() << static_cast<int>(kind) << " " << targetExists);
+            fs::remove(At("target.txt"));
+            if (targetExists)
+                Write("target.txt", "old contents");
+            size_t const entries = NumEntries();
+            ScopedFault const armed(kind, 1, code);
+            TEException const e = Raised([&] { source.CopyTo(P("target.txt"), true); });
+            EXPECT_EQ(std::tuple(e.GetErrorCode(), e.GetAPIErrorCode(), e.GetDescription()),
+                      std::tuple(error, code,
+                                 "Could not copy " + Q("source.txt") + " to " + Q("target.txt") +
+                                     ". " + reason));
+            EXPECT_STREQ(e.GetFunctionName(), "PathBase::CopyTo");
+            EXPECT_EQ(Has("target.txt") ? Read("target.txt") : "none",
+                      targetExists ? "old contents" : "none");
+            EXPECT_EQ(NumEntries(), entries); // no temporary file left behind
+        }
     }
-}
-
-TEST_F(PathFiles, FailedTemporaryFileStopsTheCopyBeforeAnythingIsWritten) {
-    Write("source.txt", "contents");
-    ScopedFault const denied(FaultKind::TemporaryFile, 1, native::kAccessDenied);
-    EXPECT_RAISES_IN(P("source.txt").CopyTo(P("t.txt"), false), TE_ACCESS_DENIED,
-                     "PathBase::CopyTo");
-    EXPECT_TRUE(denied.Fired());
-    EXPECT_EQ(NumEntries(), 1u); // no target, no temporary file
 }
 
 TEST_F(PathFiles, AccessDeniedOnDeleteKeepsTheFile) {

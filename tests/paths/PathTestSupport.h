@@ -8,17 +8,9 @@
 #include <gtest/gtest.h>
 
 #include <functional>
-#include <source_location>
 #include <string>
-#include <utility>
 
 namespace tekit::testing {
-
-/// The former name of Raised, for the path tests that still use it.
-template <class F>
-TEException Caught(F&& raise, std::source_location where = std::source_location::current()) {
-    return Raised(std::forward<F>(raise), where);
-}
 
 /// A path that stores its text exactly as given, without the normalisation of construction:
 /// to reach the rules that only such text can break.

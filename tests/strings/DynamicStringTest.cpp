@@ -1,3 +1,4 @@
+#include "TextItems.h"
 #include "support/AllocationCounter.h"
 #include "support/MultiByteFixture.h"
 
@@ -16,43 +17,7 @@ namespace {
 using testing::AllocationScope;
 using testing::kSeesLibraryAllocations;
 
-std::string Text(String const& s) {
-    return s.GetBufferReadPtr();
-}
-
-TEST(DynamicStringSharing, EmptyStringRefersToTheSharedEmptyBlockAndAllocatesNothing) {
-    String::EmptyStrCOWM(); // created on first use, once per process
-    AllocationScope scope;
-    DynamicString empty;
-    DynamicString fromNull(static_cast<char const*>(nullptr));
-    DynamicString fromEmpty("");
-    if (kSeesLibraryAllocations) {
-        EXPECT_EQ(scope.Count(), 0u);
-    }
-    for (DynamicString const* s : {&empty, &fromNull, &fromEmpty}) {
-        EXPECT_EQ(s->GetCopyOnWriteMemory(), String::EmptyStrCOWM());
-        EXPECT_EQ(*s->GetBufferReadPtr(), '\0');
-    }
-}
-
-TEST(DynamicStringSharing, CopyAddsAReferenceAndAllocatesNothing) {
-    DynamicString original("shared text", true);
-    CopyOnWriteMemory* block = original.GetCopyOnWriteMemory();
-    int const count = block->GetRefCount();
-    AllocationScope scope;
-    {
-        DynamicString copy(original);
-        DynamicString assigned;
-        assigned = original;
-        if (kSeesLibraryAllocations) {
-            EXPECT_EQ(scope.Count(), 0u);
-        }
-        EXPECT_EQ(copy.GetCopyOnWriteMemory(), block);
-        EXPECT_EQ(assigned.GetCopyOnWriteMemory(), block);
-        EXPECT_EQ(block->GetRefCount(), count + 2);
-    }
-    EXPECT_EQ(block->GetRefCount(), count);
-}
+using testing::Text;
 
 TEST(DynamicStringSharing, WritingToACopyLeavesTheOriginalAloneAndClearingNeverCopies) {
     DynamicString original("abc", true);

@@ -28,6 +28,16 @@ TEST(CopyCost, EveryCopyAddsExactlyOneReferenceEvenFromManyThreadsAtOnce) {
     DynamicString const original("shared by every thread", true);
     CopyOnWriteMemory const* block = original.GetCopyOnWriteMemory();
     ASSERT_EQ(block->GetRefCount(), 1);
+    {
+        AllocationScope scope;
+        DynamicString copy(original), assigned;
+        assigned = original;
+        if (kSeesLibraryAllocations) {
+            EXPECT_EQ(scope.Count(), 0u);
+        }
+        EXPECT_EQ(assigned.GetCopyOnWriteMemory(), block);
+        EXPECT_EQ(block->GetRefCount(), 3);
+    }
     constexpr int kThreads = 4, kCopies = 2000;
     std::vector<std::vector<DynamicString>> copies(kThreads);
     std::vector<std::thread> threads;
@@ -52,12 +62,17 @@ TEST(CopyCost, EveryCopyAddsExactlyOneReferenceEvenFromManyThreadsAtOnce) {
     EXPECT_STREQ(original.GetBufferReadPtr(), "shared by every thread");
 }
 
-TEST(CopyCost, EmptyStringsAndConstantsAllocateNothingWhenCopiedAssignedOrCleared) {
+TEST(CopyCost, EmptyStringsAndConstantsAllocateNothingWhenMadeCopiedAssignedOrCleared) {
     static GlobalConstantDynamicString const constant("interned constant text");
-    DynamicString const empty;
+    String::EmptyStrCOWM(); // created on first use, once per process
     DynamicString target("to be replaced", true);
     AllocationScope scope;
     {
+        DynamicString const empty, fromNull(static_cast<char const*>(nullptr)), fromEmpty("");
+        for (DynamicString const* s : {&empty, &fromNull, &fromEmpty}) {
+            EXPECT_EQ(s->GetCopyOnWriteMemory(), String::EmptyStrCOWM());
+            EXPECT_EQ(*s->GetBufferReadPtr(), '\0');
+        }
         DynamicString copyOfEmpty(empty), copyOfConstant(constant);
         DynamicString moved(std::move(copyOfConstant));
         target = constant;

@@ -1,3 +1,4 @@
+#include "TextItems.h"
 #include "support/MultiByteFixture.h"
 
 #include "tekit/errors/TEException.h"
@@ -15,11 +16,7 @@ namespace {
 
 using MultiByteCase = testing::MultiByteFixture;
 
-/// The text, after checking that the cached size matches the bytes in the buffer.
-std::string Text(String const& s) {
-    EXPECT_EQ(s.GetNumBytes(), int(std::strlen(s.GetBufferReadPtr())));
-    return s.GetBufferReadPtr();
-}
+using testing::Text;
 
 TEST(StringCase, OnlyAsciiLettersChangeAndRangesAreClamped) {
     DynamicString s("aBc-\xE4\xC4z");

@@ -1,5 +1,6 @@
 // Wide and UTF-8 text in and out of the family. Narrow text is in the lead-byte table's code
 // page: Latin-1 for code page 0 off Windows, Shift-JIS for 932.
+#include "TextItems.h"
 #include "support/MultiByteFixture.h"
 
 #include "tekit/strings/DynamicString.h"
@@ -12,6 +13,8 @@
 namespace tekit {
 namespace {
 
+using testing::Text;
+
 class StringConversionTest : public testing::MultiByteFixture {
 protected:
     static std::string Utf8(String const& s) {
@@ -23,7 +26,6 @@ protected:
             String::FreeUTF8(utf8);
         return out;
     }
-    static std::string Text(String const& s) { return s.GetBufferReadPtr(); }
 };
 
 #if !defined(_WIN32) // code page 0 is Latin-1 here; on Windows it is the process's ANSI page

@@ -1,3 +1,4 @@
+#include "TextItems.h"
 #include "support/MultiByteFixture.h"
 
 #include "tekit/strings/BufferString.h"
@@ -14,11 +15,7 @@ namespace {
 
 using MultiByteEdit = testing::MultiByteFixture;
 
-/// The text, after checking that the cached size matches the bytes in the buffer.
-std::string Text(String const& s) {
-    EXPECT_EQ(s.GetNumBytes(), int(std::strlen(s.GetBufferReadPtr())));
-    return s.GetBufferReadPtr();
-}
+using testing::Text;
 
 TEST(StringSubstrings, IndicesAndCountsAreClampedToTheText) {
     DynamicString s("Hello World");

@@ -1,3 +1,4 @@
+#include "TextItems.h"
 #include "support/MultiByteFixture.h"
 
 #include "tekit/strings/DynamicString.h"
@@ -13,10 +14,7 @@ namespace {
 
 using MultiByteLines = testing::MultiByteFixture;
 
-std::string Text(String const& s) {
-    EXPECT_EQ(s.GetNumBytes(), int(std::strlen(s.GetBufferReadPtr())));
-    return s.GetBufferReadPtr();
-}
+using testing::Text;
 
 std::string Line(String const& s, int index) {
     DynamicString out("stale");

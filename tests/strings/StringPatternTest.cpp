@@ -60,22 +60,15 @@ TEST(Patterns, WildcardSetEscapeAndCaseSyntax) {
         char const* pattern;
         bool ignoreCase, matches;
     } const cases[] = {
-        {"Step 1.seq", "Step ?.seq", false, true},
-        {"Step 12.seq", "Step ?.seq", false, false},
-        {"main.c", "*.[ch]", false, true},
-        {"x", "[!a-c]", false, true},
-        {"q", "[z-a]", false, true},
-        {"a*b", "a\\*b", false, true},
-        {"]", "[]]", false, true},
-        {"-", "[a-]", false, true},
-        {"]", "[\\]]", false, true},
-        {"[a", "[a", false, true},
-        {"a\\", "a\\", false, true},
-        {"a", "", false, false},
-        {"", "*", false, true},
-        {"abc", "a**c", false, true},
-        {"MAIN.C", "main.[c]", true, true},
+        // clang-format off
+        {"Step 1.seq", "Step ?.seq", false, true}, {"Step 12.seq", "Step ?.seq", false, false},
+        {"main.c", "*.[ch]", false, true}, {"x", "[!a-c]", false, true},
+        {"q", "[z-a]", false, true}, {"a*b", "a\\*b", false, true}, {"]", "[]]", false, true},
+        {"-", "[a-]", false, true}, {"]", "[\\]]", false, true}, {"[a", "[a", false, true},
+        {"a\\", "a\\", false, true}, {"a", "", false, false}, {"", "*", false, true},
+        {"abc", "a**c", false, true}, {"MAIN.C", "main.[c]", true, true},
         {"A", "[!a]", true, false},
+        // clang-format on
     };
     for (Case const& c : cases)
         EXPECT_EQ(Matches(c.text, c.pattern, c.ignoreCase), c.matches)

@@ -1,5 +1,6 @@
 // The storage kinds that cannot grow (StaticString, BufferString) and the storage-independent
 // behaviour of String: measures, the size cache, characters, comparison and obscuring.
+#include "TextItems.h"
 #include "support/DebugCapture.h"
 #include "support/MultiByteFixture.h"
 #include "support/Raises.h"
@@ -19,9 +20,7 @@ namespace {
 
 using StringTest = testing::MultiByteFixture;
 
-std::string Text(String const& s) {
-    return s.GetBufferReadPtr();
-}
+using testing::Text;
 
 TEST(StaticStringTruncation, KeepsExactlyNBytesAndCutsTheRest) {
     std::string const exact(64, 'x');

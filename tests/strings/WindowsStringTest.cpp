@@ -2,6 +2,7 @@
 // through the code page of the lead-byte table.
 #ifdef _WIN32
 
+#include "TextItems.h"
 #include "tekit/strings/DynamicString.h"
 #include "tekit/strings/MultiByte.h"
 #include "tekit/strings/StaticString.h"
@@ -16,6 +17,8 @@
 namespace tekit {
 namespace {
 
+using testing::Text;
+
 /// Each test picks the code page its bytes are written in and gets the process's back after.
 class WindowsStringTest : public ::testing::Test {
 protected:
@@ -24,8 +27,6 @@ protected:
         String::EnableMultiByteSupport(false);
         SetMultiByteCodePage(m_savedCodePage);
     }
-    static std::string Text(String const& s) { return s.GetBufferReadPtr(); }
-
     unsigned m_savedCodePage = 0;
 };
 

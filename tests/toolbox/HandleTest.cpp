@@ -9,25 +9,15 @@
 
 namespace {
 
-TEST(HandleTest, NewHandleIsZeroFilledAndSizeZeroHasNoBlock) {
-    Handle h = NewHandle(32);
-    ASSERT_NE(h, nullptr);
-    EXPECT_EQ(GetHandleSize(h), 32u);
-    EXPECT_EQ(std::string(static_cast<char*>(h->block), 32), std::string(32, '\0'));
-    DisposeHandle(h);
-
-    Handle empty = NewHandle(0);
+// Blocks start and grow zero-filled; size 0 has no block.
+TEST(HandleTest, BlocksAreZeroFilledAndKeepTheirContentWhenResized) {
+    Handle h = NewHandle(4), empty = NewHandle(0);
     EXPECT_EQ(empty->block, nullptr);
-    DisposeHandle(empty);
-    DisposeHandle(nullptr); // ignored
-}
-
-TEST(HandleTest, ResizeKeepsContentAndZeroFillsWhatIsAdded) {
-    Handle h = NewHandle(4);
+    EXPECT_EQ(std::memcmp(h->block, "\0\0\0\0", 4), 0);
     std::memcpy(h->block, "abcd", 4);
     ASSERT_EQ(SetHandleSize(h, 4096), 1);
-    EXPECT_EQ(std::memcmp(h->block, "abcd", 4), 0);
-    EXPECT_EQ(std::string(static_cast<char*>(h->block) + 4, 4092), std::string(4092, '\0'));
+    EXPECT_EQ(GetHandleSize(h), 4096u);
+    EXPECT_EQ(std::string(static_cast<char*>(h->block), 4096), "abcd" + std::string(4092, '\0'));
 
     ASSERT_EQ(SetHandleSize(h, 2), 1); // shrink, then grow again: no stale bytes come back
     ASSERT_EQ(SetHandleSize(h, 4), 1);
@@ -36,6 +26,8 @@ TEST(HandleTest, ResizeKeepsContentAndZeroFillsWhatIsAdded) {
     ASSERT_EQ(SetHandleSize(h, 0), 1);
     EXPECT_EQ(h->block, nullptr);
     DisposeHandle(h);
+    DisposeHandle(empty);
+    DisposeHandle(nullptr); // ignored
 }
 
 TEST(HandleTest, AssertTextNamesMessageLineAndFile) {

@@ -7,9 +7,9 @@
 #include <algorithm>
 #include <climits>
 #include <cstdio>
-#include <ostream>
 #include <stdexcept>
 #include <string>
+#include <tuple>
 #include <utility>
 #include <vector>
 
@@ -47,16 +47,8 @@ struct MemorySource {
     }
 };
 
-struct Line {
-    std::string text;
-    long long offset;
-    int extra;
-    bool operator==(Line const&) const = default;
-};
-
-std::ostream& operator<<(std::ostream& out, Line const& line) {
-    return out << '"' << line.text << "\"@" << line.offset << "+" << line.extra;
-}
+/// A line's text, the offset of its first byte and the count of extra line-end bytes before it.
+using Line = std::tuple<std::string, long long, int>;
 
 /// Every line up to the end of input, with the reader's position figures for each.
 std::vector<Line> ReadAll(std::string const& bytes, int maxLen, int maxRead, bool nonEmpty = false,

@@ -1,11 +1,10 @@
 #include "tekit/toolbox/Sort.h"
-#include "tekit/toolbox/List.h"
+#include "tekit/toolbox/Compare.h"
 
 #include <gtest/gtest.h>
 
 #include <algorithm>
 #include <cstdint>
-#include <cstring>
 #include <random>
 #include <stdexcept>
 #include <string>
@@ -13,21 +12,11 @@
 
 namespace {
 
-int TEKIT_CDECL CompareInts(void const* a, void const* b) {
-    int const x = *static_cast<int const*>(a), y = *static_cast<int const*>(b);
-    return x < y ? -1 : x > y;
-}
-
-/// A 12-byte record ordered by its key only, so stability and payload moves are visible.
+/// A 12-byte record ordered by its key only (IntCompare reads the first field), so stability
+/// and payload moves are visible.
 struct Record {
-    int key;
-    int order;
-    int check;
+    int key, order, check;
 };
-
-int TEKIT_CDECL CompareKeys(void const* a, void const* b) {
-    return CompareInts(a, b);
-}
 
 using SortFunction = std::int32_t(TEKIT_STDCALL*)(void*, std::int32_t, std::int32_t,
                                                   CompareFunction);
@@ -58,7 +47,7 @@ TEST(SortTest, AgreesWithStdSortOnRandomSortedReversedAndEqualKeys) {
                 for (auto data : inputs) {
                     std::vector<int> expected = data;
                     std::sort(expected.begin(), expected.end());
-                    ASSERT_EQ(sort(data.data(), std::int32_t(n), sizeof(int), CompareInts), 1);
+                    ASSERT_EQ(sort(data.data(), std::int32_t(n), sizeof(int), IntCompare), 1);
                     ASSERT_EQ(data, expected) << name << " n=" << n << " range=" << range;
                 }
             }
@@ -71,7 +60,7 @@ TEST(SortTest, LargeItemsMoveWholeAndNullComparisonOrdersByUnsignedBytes) {
         std::vector<Record> records;
         for (int i = 0; i < 500; ++i)
             records.push_back({(i * 7919) % 37, i, (i * 7919) % 37 * 31 + 1});
-        ASSERT_EQ(sort(records.data(), 500, sizeof(Record), CompareKeys), 1);
+        ASSERT_EQ(sort(records.data(), 500, sizeof(Record), IntCompare), 1);
         for (std::size_t i = 1; i < records.size(); ++i) {
             Record const &before = records[i - 1], &r = records[i];
             ASSERT_EQ(r.check, r.key * 31 + 1) << name;
@@ -89,8 +78,8 @@ TEST(SortTest, BadArgumentsAndThrowingComparisonsFailKeepingTheItems) {
     for (auto const& [name, sort] : kSorts) {
         std::vector<int> data = Data(200, 1000, 5);
         std::vector<int> items = data;
-        EXPECT_EQ(sort(nullptr, 3, 4, CompareInts) + sort(data.data(), -1, 4, CompareInts) +
-                      sort(data.data(), 3, 0, CompareInts),
+        EXPECT_EQ(sort(nullptr, 3, 4, IntCompare) + sort(data.data(), -1, 4, IntCompare) +
+                      sort(data.data(), 3, 0, IntCompare),
                   0)
             << name;
         EXPECT_EQ(data, items);
@@ -99,7 +88,7 @@ TEST(SortTest, BadArgumentsAndThrowingComparisonsFailKeepingTheItems) {
         auto throwing = [](void const* a, void const* b) -> int {
             if (++calls == 150)
                 throw std::runtime_error("stop");
-            return CompareInts(a, b);
+            return IntCompare(a, b);
         };
         EXPECT_EQ(sort(data.data(), 200, sizeof(int), throwing), 0) << name;
         std::sort(data.begin(), data.end());
@@ -114,46 +103,30 @@ TEST(BinSearchTest, ReturnsIndexOrEncodedInsertionPoint) {
         for (int i = 0; i < n; ++i)
             values.push_back(10 * i);
         for (int key = -5; key <= 10 * n + 5; key += 5) {
-            std::int32_t const got = BinSearch(values.data(), n, sizeof(int), &key, CompareInts);
+            std::int32_t const got = BinSearch(values.data(), n, sizeof(int), &key, IntCompare);
             auto const at = std::lower_bound(values.begin(), values.end(), key) - values.begin();
             bool const found = key % 10 == 0 && key >= 0 && key < 10 * n;
             EXPECT_EQ(got, found ? at : -std::int32_t(at) - 1) << n << " " << key;
         }
     }
-    EXPECT_EQ(BinSearch(nullptr, 3, 4, "key", CompareInts), -1);
+    EXPECT_EQ(BinSearch(nullptr, 3, 4, "key", IntCompare), -1);
 }
 
 /// Records each probe, to show which entries the search looks at.
 std::vector<int> gProbes;
 int TEKIT_CDECL RecordingCompare(void const* key, void const* item) {
     gProbes.push_back(*static_cast<int const*>(item));
-    return CompareInts(key, item);
+    return IntCompare(key, item);
 }
 
 TEST(BinSearchTest, HalvesSevenOrMoreEntriesAndWalksFewer) {
-    std::vector<int> const six{0, 1, 2, 3, 4, 5};
-    int const key = 5;
-    gProbes.clear();
-    EXPECT_EQ(BinSearch(six.data(), 6, sizeof(int), &key, RecordingCompare), 5);
-    EXPECT_EQ(gProbes, (std::vector<int>{0, 1, 2, 3, 4, 5}));
-
     std::vector<int> const seven{0, 1, 2, 3, 4, 5, 6};
-    int const low = -1;
+    int const five = 5, low = -1;
+    EXPECT_EQ(BinSearch(seven.data(), 6, sizeof(int), &five, RecordingCompare), 5);
+    EXPECT_EQ(gProbes, (std::vector<int>{0, 1, 2, 3, 4, 5}));
     gProbes.clear();
     EXPECT_EQ(BinSearch(seven.data(), 7, sizeof(int), &low, RecordingCompare), -1);
     EXPECT_EQ(gProbes, (std::vector<int>{3, 0}));
-}
-
-TEST(ListSortTest, WrappersSortLists) {
-    for (auto const sort : {ListHeapSort, ListQuickSort, ListInsertionSort}) {
-        std::vector<int> data = Data(300, 20, 3);
-        ListType list = ListCreate(sizeof(int));
-        ListInsertItems(list, data.data(), LIST_POS_END, 300);
-        sort(list, CompareInts);
-        std::sort(data.begin(), data.end());
-        EXPECT_EQ(std::memcmp(ListGetDataPtr(list), data.data(), 300 * sizeof(int)), 0);
-        ListDispose(list);
-    }
 }
 
 } // namespace

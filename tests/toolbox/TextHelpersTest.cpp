@@ -16,13 +16,18 @@ namespace {
 using namespace tekit;
 using TextHelpers = tekit::testing::MultiByteFixture;
 
-TEST_F(TextHelpers, WhiteSpaceScans) {
-    char const text[] = " \t\r\n\v\fab c";
+TEST_F(TextHelpers, WhiteSpaceScansAndTrims) {
+    char text[] = " \t\r\n\v\fab c \n";
     EXPECT_EQ(SkipWhiteSpace(text), text + 6);
     EXPECT_EQ(SkipNonWhiteSpace(text + 6), text + 8);
     EXPECT_EQ(HasNonWhiteSpace(" \t x") + HasNonWhiteSpace(" \t\r\n") + HasNonWhiteSpace(nullptr),
               1);
     EXPECT_EQ(SkipWhiteSpace(nullptr), SkipNonWhiteSpace(nullptr));
+    char* const copies[] = {StrDupWithoutSurrWhiteSpace(text), TBStrDup(" z ")};
+    EXPECT_EQ(RemoveSurroundingWhiteSpace(text), 4);
+    EXPECT_EQ(std::string(copies[0]) + "|" + copies[1] + "|" + text, "ab c| z |ab c");
+    for (char* copy : copies)
+        TBFree(copy);
 }
 
 TEST_F(TextHelpers, CompareIgnoringCase) {
@@ -85,6 +90,7 @@ TEST_F(TextHelpers, BadArgumentsChangeNothing) {
     EXPECT_EQ(StringCopyMax(buffer + 4, nullptr, 4), 0);                    // null copies as empty
     EXPECT_STREQ(buffer, "abc");
     EXPECT_EQ(StrDupWithoutSurrWhiteSpace(nullptr), TBStrDup(nullptr));
+    EXPECT_EQ(RemoveSurroundingWhiteSpace(nullptr), TE_INVALID_POINTER);
     EXPECT_EQ(TBStrToInt(nullptr, nullptr) + StrToUInt("1", nullptr), 0);
 }
 
