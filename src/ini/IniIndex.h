@@ -80,6 +80,7 @@ inline std::uint32_t CommonLength(char const* a, char const* b, std::uint32_t li
     return n;
 }
 
+/// The first position in `count` elements at which `less(position)` is false.
 template <class Less> std::int32_t LowerBound(std::int32_t count, Less less) {
     std::int32_t low = 0, high = count;
     while (low < high) {

@@ -2,6 +2,7 @@
 // binary search, insertion and removal that keep the indexes true, sorting, and the arena.
 #include "ini/IniObject.h"
 
+#include "ini/IniIndex.h"
 #include "ini/IniText.h"
 #include "platform/Heap.h"
 
@@ -54,18 +55,7 @@ int CompareNames(char const* a, char const* b) {
 
 namespace {
 
-/// The first position in `count` elements at which `less(position)` is false.
-template <class Less> std::int32_t LowerBound(std::int32_t count, Less less) {
-    std::int32_t low = 0, high = count;
-    while (low < high) {
-        std::int32_t const middle = low + (high - low) / 2;
-        if (less(middle))
-            low = middle + 1;
-        else
-            high = middle;
-    }
-    return low;
-}
+using index_detail::LowerBound;
 
 /// The name of an item-index entry: the tag of the item at its position.
 struct ItemName {

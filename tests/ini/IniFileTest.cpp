@@ -269,8 +269,7 @@ void StopBeforeReplacing(char const*) {
 // it is given, stopping for good just before the rename.
 TEST(IniSaveChildProcess, StopsBeforeReplacing) {
     char const* const target = std::getenv(kChildVariable);
-    if (target == nullptr)
-        GTEST_SKIP() << "runs only as the child of the IniFile save-and-kill test";
+    ASSERT_NE(target, nullptr) << "runs only as the child of the IniFile save-and-kill test";
     IniObject ini;
     FillVariant(ini, 1);
     gReadyMarker = std::string(target) + ".ready";
