@@ -1,5 +1,3 @@
-// The known directories: the XDG rules over controlled environments, the library's own
-// directory, and the strings loader's directories; on Windows, the Known Folders.
 #include "tekit/environment/KnownDirectories.h"
 #include "environment/DirectoryRules.h"
 #include "support/Raises.h"
@@ -13,6 +11,7 @@
 
 using namespace tekit;
 namespace fs = std::filesystem;
+using K = tekit::KnownDirectory;
 
 namespace {
 
@@ -23,10 +22,7 @@ DirectorySources Controlled(std::map<std::string, std::string> variables,
     DirectorySources sources;
     sources.variable = [variables](char const* name, std::string& value) {
         auto const found = variables.find(name);
-        if (found == variables.end())
-            return false;
-        value = found->second;
-        return true;
+        return found != variables.end() && (value = found->second, true);
     };
     sources.accountHome = [accountHome](std::string& path) {
         if (accountHome.empty())
@@ -38,7 +34,6 @@ DirectorySources Controlled(std::map<std::string, std::string> variables,
 }
 
 TEST(KnownDirectories, XdgVariablesAndTheirFallbacks) {
-    using K = KnownDirectory;
     struct Row {
         K which;
         std::map<std::string, std::string> variables;
@@ -72,16 +67,15 @@ TEST(KnownDirectories, XdgVariablesAndTheirFallbacks) {
 TEST(KnownDirectories, NoHomeAnywhereRaisesNamingTheDirectory) {
     // The directories that need no home still resolve.
     DirectorySources const homeless = Controlled({{"HOME", "x"}}, "");
-    EXPECT_EQ(ResolveXdgDirectory(KnownDirectory::kTemporary, homeless), "/tmp/");
-    EXPECT_EQ(ResolveXdgDirectory(KnownDirectory::kPublic, homeless), "/usr/local/share/orvane/");
-    EXPECT_EQ(
-        ResolveXdgDirectory(KnownDirectory::kCache, Controlled({{"XDG_CACHE_HOME", "/c"}}, "")),
-        "/c/orvane/");
-    EXPECT_RAISES_IN(ResolveXdgDirectory(KnownDirectory::kConfiguration, homeless),
-                     TE_PATH_NOT_FOUND, "GetKnownDirectory",
+    EXPECT_EQ(ResolveXdgDirectory(K::kTemporary, homeless), "/tmp/");
+    EXPECT_EQ(ResolveXdgDirectory(K::kPublic, homeless), "/usr/local/share/orvane/");
+    EXPECT_EQ(ResolveXdgDirectory(K::kCache, Controlled({{"XDG_CACHE_HOME", "/c"}}, "")),
+              "/c/orvane/");
+    EXPECT_RAISES_IN(ResolveXdgDirectory(K::kConfiguration, homeless), TE_PATH_NOT_FOUND,
+                     "GetKnownDirectory",
                      "Unable to find the configuration directory: neither $HOME nor the user's "
                      "account entry names an absolute home directory.");
-    EXPECT_RAISES(ResolveXdgDirectory(KnownDirectory::kBinaries, homeless), TE_PROGRAM_ERROR);
+    EXPECT_RAISES(ResolveXdgDirectory(K::kBinaries, homeless), TE_PROGRAM_ERROR);
 }
 
 TEST(KnownDirectories, JoiningAndLimits) {
@@ -100,17 +94,12 @@ TEST(KnownDirectories, BinariesAreTheDirectoryOfTheModuleHoldingTheLibrary) {
     fs::path const program = fs::canonical(fs::path(::testing::internal::GetArgvs()[0]));
     std::string const binaries = GetBinariesDirectory().CStr();
     EXPECT_EQ(fs::canonical(binaries), program.parent_path());
-    std::string const development = GetDevelopmentBinariesDirectory().CStr();
-    EXPECT_EQ(development.substr(0, binaries.size()), binaries);
-    EXPECT_EQ(development.substr(binaries.size(), 7), "modules");
+    EXPECT_EQ(std::string(GetDevelopmentBinariesDirectory().CStr()).substr(0, binaries.size() + 7),
+              binaries + "modules");
 }
 
 TEST(KnownDirectories, EveryDirectoryResolvesAbsoluteWithItsSeparator) {
-#if defined(_WIN32)
-    char const separator = '\\';
-#else
-    char const separator = '/';
-#endif
+    auto const separator = static_cast<char>(fs::path::preferred_separator);
     for (int i = 0; i < kKnownDirectoryCount; ++i) {
         auto const which = static_cast<KnownDirectory>(i);
         std::string const directory = GetKnownDirectory(which).CStr();

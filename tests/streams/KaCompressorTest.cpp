@@ -9,6 +9,7 @@
 #include <gtest/gtest.h>
 #include <zlib.h>
 
+#include <algorithm>
 #include <random>
 #include <string>
 #include <thread>
@@ -23,9 +24,7 @@ using namespace std::string_literals;
 unsigned char* U(std::string const& s) {
     return reinterpret_cast<unsigned char*>(const_cast<char*>(s.data()));
 }
-unsigned Size(std::string const& s) {
-    return static_cast<unsigned>(s.size());
-}
+auto const Size = [](std::string const& s) { return static_cast<unsigned>(s.size()); };
 
 KaCompressor gCompressor;
 
@@ -54,10 +53,8 @@ std::string const kData = "[Limits]\r\nLow = 3\r\nHigh = 9\r\n" + std::string(30
 // The header is the file format, and the data after it is exactly zlib's compress output, so
 // any zlib reader takes it.
 TEST(KaCompressor, FramesZlibOutputBehindMagicAndSizeAndRoundTrips) {
-    std::mt19937 random(1);
     std::string noise(100000, '\0');
-    for (char& c : noise)
-        c = static_cast<char>(random());
+    std::generate(noise.begin(), noise.end(), std::mt19937(1));
     for (std::string const& data : {""s, kData, noise, std::string(1 << 20, '\0')}) {
         std::string const block = Frame(data);
         std::uint32_t const n = Size(data);
@@ -88,28 +85,23 @@ TEST(KaCompressor, RefusesMalformedBlocksAndTooLittleRoom) {
         return "The compressed block's data does not uncompress to the " + std::to_string(n) +
                " bytes that its header states.";
     };
-    auto const zlibError = [](int code) {
-        return "Unable to perform compression or decompression operation (code: " +
-               std::to_string(code) + ").";
-    };
+    std::string const zlib = "Unable to perform compression or decompression operation (code: ";
     struct {
         std::string block;
-        std::size_t room;
         TEError code;
         std::string description;
+        std::size_t room = 999;
     } const cases[] = {
-        {good.substr(0, 7), 999, TE_INVALID_OR_OUT_OF_RANGE, notFramed},
-        {"PMCY" + good.substr(4), 999, TE_INVALID_OR_OUT_OF_RANGE, notFramed},
-        {WithStoredSize(good, 0xFFFFFFFFu), 999, TE_INVALID_OR_OUT_OF_RANGE,
+        {good.substr(0, 7), TE_INVALID_OR_OUT_OF_RANGE, notFramed},
+        {"PMCY" + good.substr(4), TE_INVALID_OR_OUT_OF_RANGE, notFramed},
+        {WithStoredSize(good, 0xFFFFFFFFu), TE_INVALID_OR_OUT_OF_RANGE,
          "The compressed block states an uncompressed size of 4294967295 bytes, more than its " +
              std::to_string(good.size() - 8) + " bytes of compressed data can hold."},
-        {WithStoredSize(good, Size(kData) + 1), 999, TE_OPERATION_FAILED,
-         mismatch(kData.size() + 1)},
-        {WithStoredSize(good, Size(kData) - 1), 999, TE_OPERATION_FAILED,
-         mismatch(kData.size() - 1)},
-        {good.substr(0, 14), 999, TE_OPERATION_FAILED, zlibError(-3)}, // cut short
-        {corrupt, 999, TE_OPERATION_FAILED, zlibError(-3)},
-        {good, kData.size() - 1, TE_OPERATION_FAILED, zlibError(-5)}, // too little room
+        {WithStoredSize(good, Size(kData) + 1), TE_OPERATION_FAILED, mismatch(kData.size() + 1)},
+        {WithStoredSize(good, Size(kData) - 1), TE_OPERATION_FAILED, mismatch(kData.size() - 1)},
+        {good.substr(0, 14), TE_OPERATION_FAILED, zlib + "-3)."}, // cut short
+        {corrupt, TE_OPERATION_FAILED, zlib + "-3)."},
+        {good, TE_OPERATION_FAILED, zlib + "-5).", kData.size() - 1}, // too little room
     };
     for (auto const& c : cases) {
         std::vector<unsigned char> dst(c.room);
@@ -125,7 +117,7 @@ TEST(KaCompressor, RefusesMalformedBlocksAndTooLittleRoom) {
     unsigned long room = 20;
     EXPECT_RAISES_IN(gCompressor.Compress(U(corrupt), &room, U(kData), Size(kData)),
                      TE_OPERATION_FAILED, "KaCompressor::ThrowExceptionIfError",
-                     zlibError(-5).c_str());
+                     (zlib + "-5).").c_str());
 }
 
 TEST(KaCompressor, CompressedStringIsTheEncodedBlockAndRoundTrips) {

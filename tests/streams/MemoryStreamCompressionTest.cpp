@@ -19,6 +19,7 @@ using namespace std::string_literals;
 std::string const kText = "Station 3, limits 0.5 to 2.5; " + std::string(5000, '~');
 
 TEST(MemoryStreamCompression, CompressAndUncompressReplaceTheContentsOrNothing) {
+    std::string block; // kText's, compressed
     for (std::string const& contents : {""s, kText}) {
         OVMemoryStream stream;
         Fill(stream, contents);
@@ -27,13 +28,10 @@ TEST(MemoryStreamCompression, CompressAndUncompressReplaceTheContentsOrNothing) 
         EXPECT_EQ(Bytes(stream).substr(0, 6),
                   "PMCZ"s + char(contents.size()) + char(contents.size() >> 8));
         EXPECT_EQ(stream.GetOffset(), 0u);
+        block = Bytes(stream);
         stream.Uncompress();
         EXPECT_EQ(StateOf(stream), (StreamState{0, contents}));
     }
-    OVMemoryStream framed;
-    Fill(framed, kText);
-    framed.Compress();
-    std::string const block = Bytes(framed);
     struct {
         std::string contents;
         bool compress;

@@ -98,19 +98,18 @@ TEST(IniLines, RebuildTheSectionsAndItemsOfTheLibrarysReader) {
 }
 
 TEST(IniLines, CountTheLinesAWriteDropsAndFindWhatLintReports) {
-    struct Case {
+    struct {
         char const* text;
         int comments, ignored;
         std::vector<int> problemLines;
-    };
-    Case const cases[] = {
+    } const cases[] = {
         {"[S]\nT = 1\n", 0, 0, {}},
         {"; c\n  ;c\n[S]\n;T = 1\n", 3, 0, {}},
         {"T = 1\n[S]\nT =\n[S] x\n", 0, 3, {1, 3, 4}},
         {"[S]\nT = 1\nT = 2\n[S]\n", 0, 0, {3, 4}},
         {"[S]\nV Line1 = a\nV Line2 = b\nV = c\nV Line3 = d\n", 0, 0, {4, 5}},
     };
-    for (Case const& c : cases) {
+    for (auto const& c : cases) {
         std::vector<IniLine> const lines = ReadIniLines(c.text);
         DroppedLines const dropped = CountDroppedLines(lines);
         EXPECT_EQ(dropped.comments, c.comments) << c.text;
