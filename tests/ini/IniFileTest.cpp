@@ -4,6 +4,7 @@
 #include "ini/IniTestSupport.h"
 #include "platform/Process.h"
 #include "support/FaultInjection.h"
+#include "support/ScratchDirectory.h"
 
 #include <gtest/gtest.h>
 
@@ -29,18 +30,6 @@ constexpr char kLineEnd[] = "\n";
 
 class IniFile : public ::testing::Test {
 protected:
-    void SetUp() override {
-        std::random_device random;
-        m_root = fs::temp_directory_path() / ("tekit-ini-" + std::to_string(random()));
-        fs::create_directories(m_root);
-    }
-    void TearDown() override {
-        std::error_code ignored;
-        for (auto const& entry : fs::recursive_directory_iterator(m_root, ignored))
-            fs::permissions(entry.path(), fs::perms::owner_all, fs::perm_options::add, ignored);
-        fs::remove_all(m_root, ignored);
-    }
-
     std::string At(char const* name) const { return (m_root / name).string(); }
 
     static void WriteBytes(std::string const& path, std::string const& bytes) {
@@ -59,7 +48,8 @@ protected:
         return names;
     }
 
-    fs::path m_root;
+    tekit::testing::ScratchDirectory m_scratch{"ini"};
+    fs::path const m_root = m_scratch.Root();
 };
 
 TEST_F(IniFile, BadBytesReadAsDocumented) {

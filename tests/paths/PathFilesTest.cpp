@@ -2,6 +2,7 @@
 // (the library hands them to the system unchanged).
 #include "PathTestSupport.h"
 #include "support/FaultInjection.h"
+#include "support/ScratchDirectory.h"
 #include "tekit/paths/DynamicPath.h"
 #include "tekit/paths/Path.h"
 
@@ -30,19 +31,6 @@ constexpr char kHostSeparator = '/';
 
 class PathFiles : public ::testing::Test {
 protected:
-    void SetUp() override {
-        std::random_device random;
-        m_root = fs::temp_directory_path() / ("tekit-paths-" + std::to_string(random()));
-        fs::create_directories(m_root);
-        m_rootText = m_root.string();
-    }
-    void TearDown() override {
-        std::error_code ignored;
-        for (auto const& entry : fs::recursive_directory_iterator(m_root, ignored))
-            fs::permissions(entry.path(), fs::perms::owner_all, fs::perm_options::add, ignored);
-        fs::remove_all(m_root, ignored);
-    }
-
     /// The host path of `name` inside the test directory.
     std::string At(std::string const& name) const { return m_rootText + kHostSeparator + name; }
     std::string At(std::string const& dir, std::string const& name) const {
@@ -65,8 +53,9 @@ protected:
         return size_t(std::distance(fs::directory_iterator(m_root), fs::directory_iterator()));
     }
 
-    fs::path m_root;
-    std::string m_rootText;
+    tekit::testing::ScratchDirectory m_scratch{"paths"};
+    fs::path const m_root = m_scratch.Root();
+    std::string const m_rootText = m_root.string();
 };
 
 // FILETIME of 2 January 2020, 03:04:05.1234567 UTC.
