@@ -40,10 +40,8 @@ protected:
         gPerformanceOptions = m_savedOptions;
     }
     static void EnableAsynchronousRelease(bool on) {
-        if (on)
-            gPerformanceOptions |= kPerformanceOptionAsynchronousRelease;
-        else
-            gPerformanceOptions &= ~kPerformanceOptionAsynchronousRelease;
+        gPerformanceOptions = on ? gPerformanceOptions | kPerformanceOptionAsynchronousRelease
+                                 : gPerformanceOptions & ~kPerformanceOptionAsynchronousRelease;
     }
 
     ApartmentScope m_apartment;
@@ -51,43 +49,39 @@ protected:
     std::uint32_t const m_self = platform::CurrentThreadId();
 };
 
-TEST_F(AsynchRefReleaserTest, WithoutAReleaserFlushReturnsAtOnceAndReleaseIsImmediate) {
-    EnableAsynchronousRelease(true);
-    EXPECT_EQ(AsynchRefReleaser::FlushAllReferencesNow(INFINITE), 0u);
-    AsynchRefReleaser::FlushAllReferencesNowInCallingThread(); // nothing to do, no failure
-
-    CountedObject object;
-    Holder holder = Hold(object);
-    AsynchRefReleaser::Release(holder);
-    EXPECT_EQ(holder, nullptr);
-    EXPECT_EQ(object.Count(), 1);
-    EXPECT_EQ(object.LastReleasingThread(), m_self);
-}
-
-TEST_F(AsynchRefReleaserTest, ReleaseHappensOnTheWorkerOnlyWhenOptedIn) {
-    for (bool const optIn : {false, true}) {
-        SCOPED_TRACE(optIn ? "bit 32 set" : "bit 32 clear");
+TEST_F(AsynchRefReleaserTest, ReleaseHappensOnTheWorkerOnlyWhenOneRunsAndIsOptedIn) {
+    struct Case {
+        bool optIn, running;
+        DWORD flushed; // without a releaser a flush returns at once
+    };
+    for (Case const c : {Case{true, false, 0}, Case{false, true, WAIT_OBJECT_0},
+                         Case{true, true, WAIT_OBJECT_0}}) {
+        SCOPED_TRACE(::testing::Message() << "opted in " << c.optIn << ", running " << c.running);
         AsynchRefReleaser::Cleanup(); // the options change only while no thread reads them
-        EnableAsynchronousRelease(optIn);
-        AsynchRefReleaser::Initialize();
-        AsynchRefReleaser::Initialize(); // a second call keeps the running releaser
+        EnableAsynchronousRelease(c.optIn);
+        for (int i = 0; i < 2 * c.running; ++i)
+            AsynchRefReleaser::Initialize(); // a second call keeps the running releaser
+        AsynchRefReleaser::FlushAllReferencesNowInCallingThread(); // nothing queued, no failure
         CountedObject object;
         Holder holder = Hold(object);
         AsynchRefReleaser::Release(holder);
         EXPECT_EQ(holder, nullptr);
-        EXPECT_EQ(AsynchRefReleaser::FlushAllReferencesNow(INFINITE), WAIT_OBJECT_0);
+        EXPECT_EQ(AsynchRefReleaser::FlushAllReferencesNow(INFINITE), c.flushed);
         EXPECT_EQ(object.Count(), 1);
-        EXPECT_EQ(object.LastReleasingThread() == m_self, !optIn);
+        EXPECT_EQ(object.LastReleasingThread() == m_self, !(c.optIn && c.running));
     }
 }
 
-/// Holds the worker inside the first object's release while more holders queue behind it.
+/// Opts in, starts the releaser and holds its worker inside the first object's release while
+/// more holders queue behind it.
 struct StuckWorker {
     std::atomic<bool> gate{false}, entered{false};
     CountedObject first;
     std::deque<CountedObject> queued{8};
 
     void Start() {
+        gPerformanceOptions |= kPerformanceOptionAsynchronousRelease;
+        AsynchRefReleaser::Initialize();
         Holder holder = Hold(first);
         first.BlockReleasesOn(&gate, &entered);
         AsynchRefReleaser::Release(holder);
@@ -107,8 +101,6 @@ struct StuckWorker {
 };
 
 TEST_F(AsynchRefReleaserTest, FlushWaitsForTheWorkerAndTimesOutWhileItIsStuck) {
-    EnableAsynchronousRelease(true);
-    AsynchRefReleaser::Initialize();
     StuckWorker worker;
     worker.Start();
     EXPECT_EQ(AsynchRefReleaser::FlushAllReferencesNow(30), WAIT_TIMEOUT);
@@ -120,8 +112,6 @@ TEST_F(AsynchRefReleaserTest, FlushWaitsForTheWorkerAndTimesOutWhileItIsStuck) {
 }
 
 TEST_F(AsynchRefReleaserTest, CleanupReleasesWhatIsStillQueued) {
-    EnableAsynchronousRelease(true);
-    AsynchRefReleaser::Initialize();
     StuckWorker worker;
     worker.Start();
     std::thread opener = worker.OpenGateLater();
@@ -136,8 +126,6 @@ TEST_F(AsynchRefReleaserTest, CleanupReleasesWhatIsStillQueued) {
 }
 
 TEST_F(AsynchRefReleaserTest, FlushInCallingThreadReleasesTheQueueThereAndAwaitsTheWorker) {
-    EnableAsynchronousRelease(true);
-    AsynchRefReleaser::Initialize();
     StuckWorker worker;
     worker.Start();
     worker.queued.back().OpenOnRelease(&worker.gate); // the calling thread frees the worker

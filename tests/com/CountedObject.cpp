@@ -6,14 +6,13 @@
 #include <chrono>
 #include <thread>
 
+#if defined(_WIN32)
+#include <objbase.h>
+#endif
+
 namespace tekit::testing {
 
-#if defined(_WIN32)
-// Aggregates the free-threaded marshaler, so the table hands the object itself to any thread
-// of any apartment (no proxy/stub exists for the test interface).
-IUnknown* CreateFreeThreadedMarshaler(IUnknown* outer);
-bool QueryMarshaler(IUnknown* marshaler, REFIID iid, void** object);
-#else
+#if !defined(_WIN32)
 inline constexpr HRESULT E_NOINTERFACE = static_cast<HRESULT>(0x80004002);
 #endif
 
@@ -24,9 +23,12 @@ namespace {
 GUID const kUnknownId = {0, 0, 0, {0xC0, 0, 0, 0, 0, 0, 0, 0x46}}; // IID_IUnknown
 } // namespace
 
+// On Windows the object aggregates the free-threaded marshaler, so the table hands the object
+// itself to any thread of any apartment (no proxy/stub exists for the test interface).
 CountedObject::CountedObject() {
 #if defined(_WIN32)
-    m_marshaler = CreateFreeThreadedMarshaler(this);
+    if (FAILED(::CoCreateFreeThreadedMarshaler(this, &m_marshaler)))
+        m_marshaler = nullptr;
 #endif
 }
 
@@ -45,7 +47,8 @@ HRESULT CountedObject::QueryInterface(REFIID iid, void** object) {
         return 0;
     }
 #if defined(_WIN32)
-    if (m_marshaler != nullptr && QueryMarshaler(m_marshaler, iid, object))
+    if (m_marshaler != nullptr && iid == IID_IMarshal &&
+        SUCCEEDED(m_marshaler->QueryInterface(iid, object)))
         return 0;
 #endif
     return E_NOINTERFACE;

@@ -1,17 +1,16 @@
-// The lock interface's defaults and the recursive critical sections.
+// The lock interface's defaults and the recursive critical sections, UI-aware ones included.
+#include "OtherThread.h"
+
 #include "sync/CriticalSectionObjects.h"
 
 #include "tekit/sync/CriticalSections.h"
 #include "tekit/sync/Interlock.h"
+#include "tekit/sync/LWAwareCriticalSection.h"
 #include "tekit/sync/LockPools.h"
 
 #include <gtest/gtest.h>
 
-#include <functional>
 #include <memory>
-#include <new>
-#include <thread>
-#include <utility>
 #include <vector>
 
 namespace tekit {
@@ -39,50 +38,43 @@ struct AnyLock {
 /// One of every concrete lock, fresh.
 std::vector<AnyLock> EveryLock() {
     std::vector<AnyLock> locks;
-    locks.push_back({"OSCriticalSection", std::make_unique<OSCriticalSection>(), false});
-    locks.push_back(
-        {"GlobalOSCriticalSection", std::make_unique<GlobalOSCriticalSection>(), false});
-    locks.push_back({"TestObjectArrayCriticalSectionThatAlwaysHasOnUnlock",
-                     std::make_unique<TestObjectArrayCriticalSectionThatAlwaysHasOnUnlock>(),
-                     false});
-    locks.push_back({"OVCriticalSection", std::make_unique<OVCriticalSection>(), true});
-    locks.push_back({"NamedCriticalSection", std::make_unique<NamedCriticalSection>(), true});
-    locks.push_back({"SubpropertiesLockCriticalSection",
-                     std::make_unique<SubpropertiesLockCriticalSection>(), true});
-    locks.push_back({"TestObjectMemberCriticalSection",
-                     std::make_unique<TestObjectMemberCriticalSection>(), true});
-    locks.push_back(
-        {"UltraFiniteCriticalSection", std::make_unique<UltraFiniteCriticalSection>(), true});
+#define TEKIT_ADD_LOCK(Lock, isReaderWriter)                                                       \
+    locks.push_back({#Lock, std::make_unique<Lock>(), isReaderWriter})
+    TEKIT_ADD_LOCK(OSCriticalSection, false);
+    TEKIT_ADD_LOCK(GlobalOSCriticalSection, false);
+    TEKIT_ADD_LOCK(TestObjectArrayCriticalSectionThatAlwaysHasOnUnlock, false);
+    TEKIT_ADD_LOCK(LWAwareCriticalSectionImplementation, false);
+    TEKIT_ADD_LOCK(OVCriticalSection, true);
+    TEKIT_ADD_LOCK(NamedCriticalSection, true);
+    TEKIT_ADD_LOCK(SubpropertiesLockCriticalSection, true);
+    TEKIT_ADD_LOCK(TestObjectMemberCriticalSection, true);
+    TEKIT_ADD_LOCK(UltraFiniteCriticalSection, true);
+    TEKIT_ADD_LOCK(LWAwareCriticalSection, true);
+#undef TEKIT_ADD_LOCK
     return locks;
 }
 
-/// Runs `body` on another thread and waits for it.
-void OnOtherThread(std::function<void()> const& body) {
-    std::thread(body).join();
-}
-
-TEST(Lockable, EveryLockIsExclusiveAndRecursiveForItsWriter) {
+TEST(Lockable, EveryLockIsExclusiveAndRecursiveForItsWriterButNotItsReader) {
     for (auto& [name, lock, isReaderWriter] : EveryLock()) {
         SCOPED_TRACE(name);
         EXPECT_FALSE(lock->AddRef()); // no reference counting
         lock->Release();
         lock->SetAddRefReleaseCallback(nullptr, nullptr, nullptr);
         EXPECT_EQ(lock->IsReaderWriterLock(), isReaderWriter);
+        if (isReaderWriter) { // a reader asking again is refused at once, not left waiting
+            ASSERT_TRUE(lock->Lock(kSharedAccess, 0));
+            EXPECT_FALSE(lock->Lock(kSharedAccess, 0));
+            lock->Unlock(kSharedAccess);
+        }
         ASSERT_TRUE(lock->Lock(kExclusiveAccess, 0));
         ASSERT_TRUE(lock->TryLock(kExclusiveAccess, 0)) << "the owner deepens its hold";
         EXPECT_EQ(lock->GetThreadId(), detail::CurrentLockThreadId());
         EXPECT_EQ(lock->CurrentThreadOwnsLock(kExclusiveAccess), kOwnsLockExclusively);
-        bool otherGotIt = true;
         lock->Unlock(kExclusiveAccess);
-        OnOtherThread([&] { otherGotIt = lock->TryLock(kExclusiveAccess, 0); });
-        EXPECT_FALSE(otherGotIt) << "still held once";
+        EXPECT_FALSE(OtherThreadCanTake(*lock, kExclusiveAccess)) << "still held once";
         lock->Unlock(kExclusiveAccess);
         EXPECT_EQ(lock->GetThreadId(), 0u);
-        OnOtherThread([&] {
-            otherGotIt = lock->TryLock(kExclusiveAccess, 0);
-            lock->Unlock(kExclusiveAccess);
-        });
-        EXPECT_TRUE(otherGotIt);
+        EXPECT_TRUE(OtherThreadCanTake(*lock, kExclusiveAccess));
     }
 }
 

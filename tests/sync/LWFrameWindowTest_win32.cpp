@@ -164,25 +164,16 @@ struct Blocker {
     }
     ~Blocker() { ::CloseHandle(event); }
     void Wait(int kind) {
-        switch (kind) {
-        case 0:
-            rwLock.Lock(kExclusiveAccess, 0);
-            rwLock.Unlock(kExclusiveAccess);
-            break;
-        case 1:
-            eventLock.Lock(kExclusiveAccess, 0);
-            eventLock.Unlock(kExclusiveAccess);
-            break;
-        case 2:
-            EXPECT_EQ(TEWaitForSingleObject_LWUISafe(event, INFINITE), WAIT_OBJECT_0);
-            break;
-        case 3:
-            EXPECT_EQ(TEWaitInLimitedMessageLoop(event, INFINITE), WAIT_OBJECT_0);
-            break;
-        default:
-            EXPECT_EQ(TEWaitInMessageLoop(event, INFINITE, 5), WAIT_OBJECT_0);
-            break;
+        if (kind < 2) {
+            Lockable& lock = kind == 0 ? static_cast<Lockable&>(rwLock) : eventLock;
+            lock.Lock(kExclusiveAccess, 0);
+            lock.Unlock(kExclusiveAccess);
+            return;
         }
+        DWORD const result = kind == 2   ? TEWaitForSingleObject_LWUISafe(event, INFINITE)
+                             : kind == 3 ? TEWaitInLimitedMessageLoop(event, INFINITE)
+                                         : TEWaitInMessageLoop(event, INFINITE, 5);
+        EXPECT_EQ(result, WAIT_OBJECT_0);
     }
     void Release() {
         rwLock.Unlock(kExclusiveAccess);

@@ -1,5 +1,7 @@
 // The reader-writer lock: recursion, the refusal of a repeated shared request, ownership
 // queries, and readers and writers at full contention.
+#include "OtherThread.h"
+
 #include "tekit/sync/CriticalSections.h"
 
 #include <gtest/gtest.h>
@@ -7,7 +9,6 @@
 #include <atomic>
 #include <chrono>
 #include <cstdint>
-#include <functional>
 #include <thread>
 #include <vector>
 
@@ -21,20 +22,6 @@ class ProbedLock : public RWLock<kUltraFiniteLockLevel> {
 public:
     using RWLock::InternalTryLock;
 };
-
-void OnOtherThread(std::function<void()> const& body) {
-    std::thread(body).join();
-}
-
-bool OtherThreadCanTake(Lockable& lock, LockAccessType access) {
-    bool taken = false;
-    OnOtherThread([&] {
-        taken = lock.TryLock(access, 0);
-        if (taken)
-            lock.Unlock(access);
-    });
-    return taken;
-}
 
 TEST(RWLock, WriterTakesItAgainSharedOrExclusiveAndFreesItAfterAsManyReleases) {
     ProbedLock lock;
