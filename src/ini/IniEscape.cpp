@@ -7,6 +7,7 @@
 // meets the same characters that escaping wrote.
 #include "ini/IniEscape.h"
 
+#include "strings/CharScan.h"
 #include "strings/MultiByteChars.h"
 
 namespace tekit::ini {
@@ -41,16 +42,6 @@ int WholeChar(unsigned char const* text, bool mb) {
     return mb && mbcs::IsLeadByte(static_cast<char>(text[0])) && text[1] != 0 && !IsControl(text[1])
                ? 2
                : 1;
-}
-
-int HexValue(char c) {
-    if (c >= '0' && c <= '9')
-        return c - '0';
-    if (c >= 'a' && c <= 'f')
-        return c - 'a' + 10;
-    if (c >= 'A' && c <= 'F')
-        return c - 'A' + 10;
-    return -1;
 }
 
 } // namespace
@@ -125,8 +116,8 @@ std::size_t Unescape(char const* text, char* out, std::size_t capacity, bool mb)
             byte = '\r';
         } else if (c == 't') {
             byte = '\t';
-        } else if (c == 'x' && HexValue(p[2]) >= 0 && HexValue(p[3]) >= 0) {
-            byte = static_cast<char>(HexValue(p[2]) * 16 + HexValue(p[3]));
+        } else if (c == 'x' && detail::IsHexDigit(p[2]) && detail::IsHexDigit(p[3])) {
+            byte = static_cast<char>(detail::HexValue(p[2]) * 16 + detail::HexValue(p[3]));
             consumed = 4;
         } else if (mb && mbcs::CharBytes(p + 1) == 2) {
             // A backslash before a double-byte character gives that character.

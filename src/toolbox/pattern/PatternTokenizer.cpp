@@ -1,6 +1,7 @@
 // The pattern tokenizer: one left-to-right pass; the first error found is the one reported.
 #include "toolbox/pattern/PatternTokenizer.h"
 
+#include "strings/CharScan.h"
 #include "strings/MultiByteChars.h"
 #include "tekit/toolbox/RegExpr.h"
 
@@ -8,14 +9,9 @@ namespace tekit::toolbox::pattern {
 
 namespace {
 
+/// The value of a hexadecimal digit, or -1 for any other character.
 int HexDigit(char c) {
-    if (c >= '0' && c <= '9')
-        return c - '0';
-    if (c >= 'a' && c <= 'f')
-        return c - 'a' + 10;
-    if (c >= 'A' && c <= 'F')
-        return c - 'A' + 10;
-    return -1;
+    return detail::IsHexDigit(c) ? detail::HexValue(c) : -1;
 }
 
 class Tokenizer {
