@@ -1,6 +1,7 @@
 // Reading INI text: each line is classified (comment, section header, item, or ignored) and
 // the object grows by appending; multi-line items are joined, and order and indexes restored,
 // when the input ends.
+#include "ini/IniObjSupport.h"
 #include "ini/IniObject.h"
 #include "ini/IniText.h"
 
@@ -169,7 +170,51 @@ int TEKIT_STDCALL ReadFileChunk(void* data, int numBytes, int* numBytesRead, voi
     return 0;
 }
 
+/// The line reader's chunk callback over bytes in memory.
+struct MemorySource {
+    char const* next = nullptr;
+    std::size_t left = 0;
+};
+
+int TEKIT_STDCALL ReadMemoryChunk(void* data, int numBytes, int* numBytesRead, void* buffer) {
+    auto& source = *static_cast<MemorySource*>(data);
+    std::size_t const take =
+        std::min(source.left, static_cast<std::size_t>(numBytes > 0 ? numBytes : 0));
+    std::memcpy(buffer, source.next, take);
+    source.next += take;
+    source.left -= take;
+    *numBytesRead = static_cast<int>(take);
+    return 0;
+}
+
+/// Reads what `reader` delivers into the object: 0 or a status.
+int ReadThroughLineReader(IniObjectRec& ini, LineFile reader) {
+    return toolbox::Guarded<int>(INI_ERR_OUT_OF_MEMORY, [&] {
+        return ReadLines(
+            ini, [&](char* line, std::size_t& length, bool& endOfInput, std::int32_t& lineNumber) {
+                int kept = 0, end = 0;
+                int const result = LineFile_ReadNonEmpty(reader, line, kMaxLineLength, &kept, &end);
+                if (result < 0)
+                    return static_cast<int>(INI_ERR_CANT_READ_FILE);
+                length = static_cast<std::size_t>(kept);
+                endOfInput = end != 0;
+                lineNumber = LineFile_NumLinesRead(reader);
+                return 0;
+            });
+    });
+}
+
 } // namespace
+
+int ReadFromMemory(IniHandle ini, char const* text, std::size_t size) {
+    if (!IsValid(ini) || (!text && size > 0))
+        return INI_ERR_INVALID_ARGUMENT;
+    MemorySource source{text, size};
+    LineFile const reader = LineFile_New(ReadMemoryChunk, &source);
+    int const status = reader ? ReadThroughLineReader(*ini, reader) : INI_ERR_OUT_OF_MEMORY;
+    LineFile_Dispose(reader);
+    return status;
+}
 
 } // namespace tekit::ini
 
@@ -208,21 +253,7 @@ extern "C" int TEKIT_STDCALL Ini_ReadFromFile(IniHandle ini, char const* path) {
     source.block = static_cast<char*>(tekit::platform::HeapAllocate(kFileBlockSize));
     source.size = kFileBlockSize;
     LineFile const reader = source.block ? LineFile_New(ReadFileChunk, &source) : nullptr;
-    int status = INI_ERR_OUT_OF_MEMORY;
-    if (reader)
-        status = Guarded<int>(INI_ERR_OUT_OF_MEMORY, [&] {
-            return ReadLines(*ini, [&](char* line, std::size_t& length, bool& endOfInput,
-                                       std::int32_t& lineNumber) {
-                int kept = 0, end = 0;
-                int const result = LineFile_ReadNonEmpty(reader, line, kMaxLineLength, &kept, &end);
-                if (result < 0)
-                    return static_cast<int>(INI_ERR_CANT_READ_FILE);
-                length = static_cast<std::size_t>(kept);
-                endOfInput = end != 0;
-                lineNumber = LineFile_NumLinesRead(reader);
-                return 0;
-            });
-        });
+    int const status = reader ? ReadThroughLineReader(*ini, reader) : INI_ERR_OUT_OF_MEMORY;
     LineFile_Dispose(reader);
     tekit::platform::HeapFree(source.block);
     tekit::platform::CloseFile(source.file);

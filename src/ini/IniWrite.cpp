@@ -7,6 +7,7 @@
 // a lone lead byte), it writes the item as pieces and may put a later piece of an unquoted
 // item in quotes: the joined item takes its quoted flag from its first piece, so the quotes of
 // the others are not seen.
+#include "ini/IniObjSupport.h"
 #include "ini/IniObject.h"
 #include "ini/IniSeams.h"
 #include "ini/IniText.h"
@@ -16,6 +17,7 @@
 #include "tekit/strings/String.h"
 #include "toolbox/FlatGuard.h"
 
+#include <algorithm>
 #include <charconv>
 #include <cstring>
 #include <string>
@@ -32,7 +34,6 @@ constexpr char kLineEnd[] = "\r\n";
 constexpr char kLineEnd[] = "\n";
 #endif
 constexpr char kTemporaryPrefix[] = "ini$$";
-constexpr std::size_t kFileBlockSize = 64 * 1024;
 
 /// Lines handed one by one to the caller's callback.
 class CallbackSink {
@@ -52,25 +53,36 @@ private:
     std::string m_line;
 };
 
-/// Lines gathered into large blocks written to an open file.
+/// Lines gathered into 64 KiB blocks written to an open file.
 class FileSink {
 public:
-    explicit FileSink(platform::NativeFile file) : m_file(file) { m_block.reserve(kFileBlockSize); }
-    void Append(char const* text, std::size_t length) { m_block.append(text, length); }
+    explicit FileSink(platform::NativeFile file) : m_writer(file) {}
+    void Append(char const* text, std::size_t length) { m_writer.Append(text, length); }
     int EndLine() {
-        m_block.append(kLineEnd, sizeof kLineEnd - 1);
-        return m_block.size() >= kFileBlockSize ? Flush() : 0;
+        return m_writer.Append(kLineEnd, sizeof kLineEnd - 1) ? 0 : INI_ERR_WRITE_FAILED;
     }
-    int Flush() {
-        if (!m_block.empty() && platform::WriteToFile(m_file, m_block.data(), m_block.size()))
-            return INI_ERR_WRITE_FAILED;
-        m_block.clear();
+    int Flush() { return m_writer.Flush() ? 0 : INI_ERR_WRITE_FAILED; }
+    platform::SystemError const& Failure() const { return m_writer.Failure(); }
+
+private:
+    FileBlockWriter m_writer;
+};
+
+/// Lines appended to a string in memory.
+class StringSink {
+public:
+    StringSink(std::string& out, char const* lineEnd)
+        : m_out(out), m_lineEnd(lineEnd), m_lineEndLength(std::strlen(lineEnd)) {}
+    void Append(char const* text, std::size_t length) { m_out.append(text, length); }
+    int EndLine() {
+        m_out.append(m_lineEnd, m_lineEndLength);
         return 0;
     }
 
 private:
-    platform::NativeFile m_file;
-    std::string m_block;
+    std::string& m_out;
+    char const* m_lineEnd;
+    std::size_t m_lineEndLength;
 };
 
 template <class Sink> class Writer {
@@ -240,46 +252,82 @@ bool IsMissing(platform::SystemError const& error) {
            error.code == platform::native::kPathNotFound;
 }
 
-/// Writes the object to the new file `file` and makes it durable; 0 or a status.
-int FillTemporaryFile(IniObjectRec& ini, platform::NativeFile file) {
+/// Writes the object to the new file `file`; 0 or a status.
+int FillWithText(void* context, platform::NativeFile file, platform::SystemError& failure) {
     FileSink sink(file);
-    int status = WriteAll(ini, sink);
+    int status = WriteAll(*static_cast<IniObjectRec*>(context), sink);
     if (status >= 0)
         status = sink.Flush();
-    if (status >= 0 && platform::FlushFile(file))
-        status = INI_ERR_WRITE_FAILED;
+    failure = sink.Failure();
     return status;
 }
 
-int WriteFileAtomically(IniObjectRec& ini, char const* path) {
+} // namespace
+
+FileBlockWriter::FileBlockWriter(platform::NativeFile file) : m_file(file) {
+    m_block.reserve(kWriteBlockSize);
+}
+
+bool FileBlockWriter::Append(void const* data, std::size_t size) {
+    auto const* bytes = static_cast<char const*>(data);
+    while (!m_failure && size > 0) {
+        std::size_t const take = std::min(size, kWriteBlockSize - m_block.size());
+        m_block.append(bytes, take);
+        bytes += take;
+        size -= take;
+        if (m_block.size() == kWriteBlockSize)
+            Flush();
+    }
+    return !m_failure;
+}
+
+bool FileBlockWriter::Flush() {
+    if (!m_failure && !m_block.empty())
+        m_failure = platform::WriteToFile(m_file, m_block.data(), m_block.size());
+    m_block.clear();
+    return !m_failure;
+}
+
+int ReplaceFileAtomically(char const* path, FileFiller fill, void* context,
+                          platform::SystemError& failure) {
+    failure = {};
     platform::FileInfo info;
     platform::SystemError const queried = platform::QueryFile(path, info);
     bool const exists = !queried;
-    if (queried && !IsMissing(queried))
+    if (queried && !IsMissing(queried)) {
+        failure = queried;
         return INI_ERR_CANT_WRITE_FILE;
+    }
     if (exists && (info.isDirectory || info.isReadOnly))
         return INI_ERR_CANT_WRITE_FILE;
 
     std::string temporary;
     platform::NativeFile file = platform::kNoFile;
     if (platform::SystemError const error =
-            platform::CreateUniqueFile(path, kTemporaryPrefix, temporary, &file))
+            platform::CreateUniqueFile(path, kTemporaryPrefix, temporary, &file)) {
+        failure = error;
         return error.code == platform::native::kDiskFull ? INI_ERR_WRITE_FAILED
                                                          : INI_ERR_CANT_WRITE_FILE;
+    }
     // The replacement gets the target's permissions, or a new file's. Where the file system
     // refuses (some do not keep them), the file stays as it was created: for its owner only.
     (void)platform::CopyFilePermissions(exists ? path : nullptr, file);
     int status =
-        toolbox::Guarded<int>(INI_ERR_OUT_OF_MEMORY, [&] { return FillTemporaryFile(ini, file); });
-    if (platform::CloseFile(file) && status >= 0)
+        toolbox::Guarded<int>(INI_ERR_OUT_OF_MEMORY, [&] { return fill(context, file, failure); });
+    if (status >= 0)
+        if ((failure = platform::FlushFile(file)))
+            status = INI_ERR_WRITE_FAILED;
+    if (platform::SystemError const closed = platform::CloseFile(file); closed && status >= 0) {
+        failure = closed;
         status = INI_ERR_WRITE_FAILED;
+    }
     if (status >= 0) {
         if (gBeforeReplaceHook)
             gBeforeReplaceHook(temporary.c_str());
         // One rename replaces the target: on Windows MoveFileExA with
         // MOVEFILE_REPLACE_EXISTING, so there is no moment without a target (deleting first
         // and then renaming would leave one).
-        if (platform::RenameFile(temporary.c_str(), path, true))
+        if ((failure = platform::RenameFile(temporary.c_str(), path, true)))
             status = INI_ERR_WRITE_FAILED;
     }
     if (status < 0)
@@ -287,7 +335,21 @@ int WriteFileAtomically(IniObjectRec& ini, char const* path) {
     return status;
 }
 
-} // namespace
+int WriteTextFile(IniHandle ini, char const* path, platform::SystemError& failure) {
+    failure = {};
+    if (!IsValid(ini) || !path || !*path)
+        return INI_ERR_INVALID_ARGUMENT;
+    return ReplaceFileAtomically(path, FillWithText, ini, failure);
+}
+
+int WriteToMemory(IniHandle ini, std::string& out, char const* lineEnd) {
+    if (!IsValid(ini) || !lineEnd)
+        return INI_ERR_INVALID_ARGUMENT;
+    return toolbox::Guarded<int>(INI_ERR_OUT_OF_MEMORY, [&] {
+        StringSink sink(out, lineEnd);
+        return WriteAll(*ini, sink);
+    });
+}
 
 } // namespace tekit::ini
 
@@ -304,8 +366,6 @@ extern "C" int TEKIT_STDCALL Ini_WriteGeneric(IniHandle ini, IniWriteLineCallbac
 }
 
 extern "C" int TEKIT_STDCALL Ini_WriteToFile(IniHandle ini, char const* path) {
-    if (!IsValid(ini) || !path || !*path)
-        return INI_ERR_INVALID_ARGUMENT;
-    return tekit::toolbox::Guarded<int>(INI_ERR_OUT_OF_MEMORY,
-                                        [&] { return WriteFileAtomically(*ini, path); });
+    tekit::platform::SystemError failure;
+    return WriteTextFile(ini, path, failure);
 }

@@ -21,6 +21,11 @@ using CLocaleHandle = locale_t;
 /// only when the run-time cannot create it (the conversions then use the process's locale).
 CLocaleHandle StandardCLocale();
 
+/// A new locale of the run-time named `name` ("de_DE.UTF-8", "German_Germany.1252", ...),
+/// freed with FreeCLocale; null when the run-time knows no such locale.
+CLocaleHandle CreateNamedCLocale(char const* name);
+void FreeCLocale(CLocaleHandle locale);
+
 /// strtod in `locale` (null: the library's "C" locale).
 double StringToDoubleInLocale(char const* text, char** end, CLocaleHandle locale);
 /// Compares ignoring case as `locale` folds it (null: the "C" locale): <0, 0 or >0.

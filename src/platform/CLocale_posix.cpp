@@ -20,6 +20,15 @@ CLocaleHandle StandardCLocale() {
     return locale;
 }
 
+CLocaleHandle CreateNamedCLocale(char const* name) {
+    return ::newlocale(LC_ALL_MASK, name, locale_t(0));
+}
+
+void FreeCLocale(CLocaleHandle locale) {
+    if (locale != locale_t(0))
+        ::freelocale(locale);
+}
+
 double StringToDoubleInLocale(char const* text, char** end, CLocaleHandle locale) {
     locale = OrStandard(locale);
     return locale != locale_t(0) ? ::strtod_l(text, end, locale) : ::strtod(text, end);

@@ -19,6 +19,15 @@ CLocaleHandle StandardCLocale() {
     return locale;
 }
 
+CLocaleHandle CreateNamedCLocale(char const* name) {
+    return ::_create_locale(LC_ALL, name);
+}
+
+void FreeCLocale(CLocaleHandle locale) {
+    if (locale != nullptr)
+        ::_free_locale(locale);
+}
+
 double StringToDoubleInLocale(char const* text, char** end, CLocaleHandle locale) {
     locale = OrStandard(locale);
     return locale != nullptr ? ::_strtod_l(text, end, locale) : ::strtod(text, end);

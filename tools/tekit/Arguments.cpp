@@ -41,8 +41,10 @@ void TakeOption(std::vector<std::string> const& words, size_t& i,
         call.options[name] = "";
     } else if (equals != std::string::npos) {
         call.options[name] = word.substr(equals + 1);
+        call.values.emplace_back(name, call.options[name]);
     } else if (i + 1 < words.size()) {
         call.options[name] = words[++i];
+        call.values.emplace_back(name, call.options[name]);
     } else {
         throw UsageError("option " + name + " needs a value (" + spec->valueName + ")", command);
     }

@@ -1,18 +1,26 @@
 // tekit ini: INI files as the library reads and writes them — list, get and set values, remove
-// sections and items, sort, dump everything with its line numbers, and check a file for the
-// lines the reader ignores.
+// sections and items, sort, dump everything with its line numbers, check a file for the lines
+// the reader ignores, convert between the text and the two binary forms, and show or edit the
+// header section.
 //
 //   tekit ini get station.ini Limits High
 //   tekit ini set --int station.ini Limits High 5
 //   tekit ini lint station.ini
+//   tekit ini convert station.ini station.bin --to binary
+//   tekit ini header --set Description='Line 3' station.bin
 #include "Arguments.h"
 #include "Commands.h"
 #include "IniLines.h"
 #include "Output.h"
 
 #include "tekit/errors/RString.h"
+#include "tekit/errors/TEException.h"
 #include "tekit/ini/Ini.h"
+#include "tekit/ini/IniHeader.h"
+#include "tekit/ini/IniObj.h"
+#include "tekit/paths/Path.h"
 #include "tekit/toolbox/MemoryHelpers.h"
+#include "tekit/toolbox/Version.h"
 
 #include <cerrno>
 #include <charconv>
@@ -38,18 +46,23 @@ char const kGroupDetails[] =
 "tag = value" is an item, a line starting with ";" is a comment, and a value in double quotes
 is a quoted value. Other lines are ignored ("tekit ini lint" shows which, and why). Names of
 sections and tags are case-sensitive. Commands that only read take "-" for standard input.
+A FILE may also be in one of the library's two binary forms (see "tekit help ini convert"),
+told apart by its first bytes; "-" takes the text forms only.
 
-set, remove and sort -o write the whole file again as the library writes INI files, through a
+set, remove, sort -o and header --set write the whole file again as the library writes INI
+files, through a
 temporary file that replaces it in one step, so it is either the old or the new file, never
-a mix. Comments and the lines the reader ignores are not kept (a note on standard error says
-how many were dropped); a long value is written as numbered continuation lines
-("Tag Line0001", ...), which the reader joins.
+a mix, and in the form it had. Comments and the lines the reader ignores are not kept (a note
+on standard error says how many were dropped); a long value is written as numbered
+continuation lines ("Tag Line0001", ...), which the reader joins.
 
 Examples:
   tekit ini sections station.ini
   tekit ini get station.ini Limits High
   tekit ini set --double station.ini Limits High 5.25
   tekit ini lint station.ini
+  tekit ini convert station.ini station.bin --to binary
+  tekit ini header station.bin
 
 Exit status:
   0  success
@@ -235,12 +248,96 @@ Exit status:
   2  the command line was wrong
 )";
 
+char const kConvertDetails[] =
+    R"(Reads IN in whichever of the three forms it has ("-": standard input, a text form) and writes
+the same document to OUT in the form FORM asks, replacing OUT in one step through a temporary
+file beside it (OUT may be IN itself). The forms:
+
+  text         INI text
+  binary       the compressed binary form: a 32-byte header ("OrvaneBinary", NUL-padded to
+               20 bytes; the data offset 32; 0; the text's length, each 4 bytes little-endian)
+               and the INI text compressed with zlib
+  binary-text  the text binary form: "OrvaneBinaryText" and the INI text as a compressed
+               string, all printable characters
+
+A file is read as the text binary form when it begins with "OrvaneBinaryText", as the
+compressed binary form when it begins with "OrvaneBinary", and as INI text otherwise. The
+text inside both binary forms has CR LF line ends. Comments and ignored lines of a text IN
+are not carried over.
+
+Options:
+  --to FORM   text, binary or binary-text (required)
+  -h, --help  Print this help
+
+Examples:
+  tekit ini convert station.ini station.bin --to binary
+  tekit ini convert station.bin station.ini --to text
+
+Exit status:
+  0  OUT was written
+  1  IN could not be read (a damaged binary form is named as such) or OUT could not be written
+     (it is left as it was)
+  2  the command line was wrong
+)";
+
+char const kHeaderDetails[] =
+    R"(Shows the header section "[__Header__]" of FILE (any form; "-": standard input, a text
+form): its tags Type, Version (the format version), ProductName, ProductVersion,
+CompatibleProdVersion (the oldest product version that reads the file),
+ProductVersionString, Description, Path and CharEncoding, a missing one shown empty (Version
+0, CharEncoding SBCS), then the file's form and whether the header is valid: it has a Type,
+and a Version that is a whole number if it has one.
+
+With --set TAG=VALUE (repeatable) it sets those tags instead and writes FILE again in its
+form, the header section first (see "tekit help ini"); a missing section is created. Version
+takes a whole number, ProductVersion and CompatibleProdVersion a version such as 4.2.1.77 (up
+to four numbers), CharEncoding SBCS, DBCS or Unicode.
+
+Options:
+  --set TAG=VALUE  Set a tag of the header section (repeatable)
+  --json           Print JSON: one object with the tags, "form" and "valid"
+  -h, --help       Print this help
+
+Examples:
+  tekit ini header station.ini
+  tekit ini header --set Type=LimitsFile --set Version=3 station.ini
+
+Exit status:
+  0  the header was shown and is valid, or FILE was written
+  1  FILE has no header section or an invalid one, or could not be read or written
+  2  the command line was wrong: an unknown tag, or a VALUE that does not fit it
+)";
+
 // ---- Reading and writing files ---------------------------------------------------------------
 
-struct IniDeleter {
-    void operator()(IniObjectRec* ini) const { Ini_Dispose(ini); }
+/// The three forms of an INI file.
+enum class Form { kText, kBinary, kBinaryText };
+
+char const* FormName(Form form) {
+    return form == Form::kText ? "text" : form == Form::kBinary ? "binary" : "binary-text";
+}
+
+/// The form of a file that begins with `bytes`: the library's magic test, the text binary
+/// form's magic first.
+Form FormOf(std::string const& bytes) {
+    if (bytes.starts_with(IniObj::kBinaryTextMagic))
+        return Form::kBinaryText;
+    return bytes.starts_with(IniObj::kBinaryMagic) ? Form::kBinary : Form::kText;
+}
+
+/// A document of the library (reached by the flat functions through get()) and the form of the
+/// file it was read from.
+class Ini {
+public:
+    Ini() : m_object(std::make_unique<IniObj>()) {}
+    IniObjectRec* get() const { return m_object->GetHandle(); }
+    IniObj& Object() const { return *m_object; }
+
+    Form form = Form::kText;
+
+private:
+    std::unique_ptr<IniObj> m_object;
 };
-using Ini = std::unique_ptr<IniObjectRec, IniDeleter>;
 
 /// The library's message for an INI status.
 std::string StatusText(int status) {
@@ -293,15 +390,31 @@ int TEKIT_STDCALL ReadTextLine(void* data, char* buffer, int bufferSize, int* en
     return status < 0 ? status : length;
 }
 
-/// `file` read into a new object: through Ini_ReadFromFile, or for "-" the text of standard
-/// input through Ini_ReadGeneric. `text` (when given) gets the bytes that were read.
+/// A library exception about reading a file (its description names the file) as the tool's
+/// error.
+ToolError FileError(TEException const& e) {
+    return ToolError(e.GetDescription());
+}
+
+/// `file` read into a new object: through IniObj::ReadFile (any form), or for "-" the text of
+/// standard input through Ini_ReadGeneric (the text binary form through IniObj::ReadString).
+/// `text` (when given) gets the INI text that was read: none for a binary form.
 Ini Load(std::string const& file, std::string* text = nullptr) {
-    Ini ini(Ini_New(0, nullptr));
-    if (!ini)
-        throw std::bad_alloc();
+    Ini ini;
     int status = 0;
     if (file == "-") {
         std::string const bytes = ReadAll(file);
+        ini.form = FormOf(bytes);
+        if (ini.form == Form::kBinary)
+            throw ToolError(Shown(file) + ": the compressed binary form is read from a FILE only");
+        if (ini.form == Form::kBinaryText) {
+            try {
+                ini.Object().ReadString(DynamicString(bytes.c_str()));
+            } catch (TEException const& e) {
+                throw ToolError(Shown(file) + ": " + e.GetDescription());
+            }
+            return ini;
+        }
         TextSource source{bytes};
         LineFile reader = NewTextReader(source);
         if (!reader)
@@ -311,23 +424,41 @@ Ini Load(std::string const& file, std::string* text = nullptr) {
         if (text)
             *text = bytes;
     } else {
-        status = Ini_ReadFromFile(ini.get(), file.c_str());
-        if (status == INI_ERR_CANT_OPEN_FILE)
-            ReadAll(file); // throws with the system's reason
-        if (status >= 0 && text)
-            *text = ReadAll(file);
+        std::string const bytes = ReadAll(file); // throws with the system's reason
+        ini.form = FormOf(bytes);
+        try {
+            ini.Object().ReadFile(Path(file.c_str()));
+        } catch (TEException const& e) {
+            throw FileError(e);
+        }
+        if (text && ini.form == Form::kText)
+            *text = bytes;
     }
     if (status < 0)
         throw ToolError(Shown(file) + ": " + StatusText(status));
     return ini;
 }
 
-/// Writes `ini` to `file` in one step, and says on standard error how many lines of the text
-/// it was read from (`text`, of `source`) the written file does not have.
-void Save(IniObjectRec* ini, std::string const& file, std::string const& text,
+/// Writes `ini` to `file` in `form` in one step.
+void Write(Ini const& ini, std::string const& file, Form form) {
+    if (form == Form::kText) {
+        if (int const status = Ini_WriteToFile(ini.get(), file.c_str()); status < 0)
+            throw ToolError(Shown(file) + ": " + StatusText(status) + " It was left as it was.");
+        return;
+    }
+    try {
+        ini.Object().WriteFile(Path(file.c_str()), true, form == Form::kBinaryText);
+    } catch (TEException const& e) {
+        throw ToolError(Shown(file) + ": " + e.GetDescription() + " It was left as it was.");
+    }
+}
+
+/// Writes `ini` to `file` in one step in the form it was read in, and says on standard error
+/// how many lines of the text it was read from (`text`, of `source`) the written file does not
+/// have.
+void Save(Ini const& ini, std::string const& file, std::string const& text,
           std::string const& source) {
-    if (int const status = Ini_WriteToFile(ini, file.c_str()); status < 0)
-        throw ToolError(Shown(file) + ": " + StatusText(status) + " It was left as it was.");
+    Write(ini, file, ini.form);
     DroppedLines const dropped = CountDroppedLines(ReadIniLines(text));
     if (!dropped.comments && !dropped.ignored)
         return;
@@ -382,9 +513,9 @@ Item NthItem(IniObjectRec* ini, IniSection section, int index) {
 /// The text the library's string getter gives for a stored value (escapes undone), whichever
 /// item of a section it belongs to.
 std::string Unescaped(std::string const& raw) {
-    Ini scratch(Ini_New(0, nullptr));
+    Ini scratch;
     char* value = nullptr;
-    if (!scratch || Ini_PutRawString(scratch.get(), "s", "t", raw.c_str()) < 0 ||
+    if (Ini_PutRawString(scratch.get(), "s", "t", raw.c_str()) < 0 ||
         Ini_GetStringCopy(scratch.get(), "s", "t", &value) != 1)
         return raw; // a blank value: nothing to undo
     std::string const text = value;
@@ -626,13 +757,11 @@ int RunSet(Invocation const& call) {
     if (probe)
         std::fclose(probe);
     std::string text;
-    Ini ini = exists ? Load(file, &text) : Ini(Ini_New(0, nullptr));
-    if (!ini)
-        throw std::bad_alloc();
+    Ini ini = exists ? Load(file, &text) : Ini();
     if (int const status = Put(ini.get(), type, section.c_str(), tag.c_str(), call.arguments[3]);
         status < 0)
         throw ToolError(Shown(file) + ": " + StatusText(status) + " It was left as it was.");
-    Save(ini.get(), file, text, file);
+    Save(ini, file, text, file);
     return kSuccess;
 }
 
@@ -652,7 +781,7 @@ int RunRemove(Invocation const& call) {
     } else {
         Ini_RemoveSection(ini.get(), section.c_str());
     }
-    Save(ini.get(), file, text, file);
+    Save(ini, file, text, file);
     return kSuccess;
 }
 
@@ -672,7 +801,7 @@ int RunSort(Invocation const& call) {
         if (out->second.empty() || out->second == "-")
             throw UsageError("-o needs a file to write (without -o the result is printed)",
                              "ini sort");
-        Save(ini.get(), out->second, text, file);
+        Save(ini, out->second, text, file);
     } else if (int const status = Ini_WriteGeneric(ini.get(), PrintLine, nullptr); status < 0) {
         throw ToolError(Shown(file) + ": " + StatusText(status));
     }
@@ -744,6 +873,123 @@ int RunLint(Invocation const& call) {
     return kFailure;
 }
 
+int RunConvert(Invocation const& call) {
+    RequireArguments(call, 2, 2, "ini convert", "IN and OUT");
+    auto const to = call.options.find("--to");
+    if (to == call.options.end())
+        throw UsageError("--to FORM is required: text, binary or binary-text", "ini convert");
+    Form form = Form::kText;
+    if (to->second == "binary")
+        form = Form::kBinary;
+    else if (to->second == "binary-text")
+        form = Form::kBinaryText;
+    else if (to->second != "text")
+        throw UsageError("--to takes text, binary or binary-text, not " +
+                             Quote(tool::Shown(to->second)),
+                         "ini convert");
+    std::string const& out = call.arguments[1];
+    if (out == "-")
+        throw UsageError("OUT must be a file: the binary forms are not printed", "ini convert");
+    Ini const ini = Load(call.arguments[0]);
+    Write(ini, out, form);
+    return kSuccess;
+}
+
+/// The tags of the header section, in the order they are shown.
+char const* const kHeaderTags[] = {
+    IniHeader::kTypeTag,
+    IniHeader::kFormatVersionTag,
+    IniHeader::kProductNameTag,
+    IniHeader::kProductVersionTag,
+    IniHeader::kCompatibleProductVersionTag,
+    IniHeader::kProductDisplayVersionTag,
+    IniHeader::kDescriptionTag,
+    IniHeader::kPathTag,
+    IniHeader::kCharEncodingTag,
+};
+
+/// Sets one tag of `header` from "TAG=VALUE"; a VALUE that does not fit the tag is a usage
+/// error.
+void SetHeaderTag(IniObj& header, std::string const& assignment) {
+    char const* const command = "ini header";
+    size_t const equals = assignment.find('=');
+    std::string const tag = assignment.substr(0, equals);
+    std::string const value = equals == std::string::npos ? "" : assignment.substr(equals + 1);
+    bool known = false;
+    for (char const* name : kHeaderTags)
+        known = known || tag == name;
+    if (equals == std::string::npos || !known)
+        throw UsageError("--set takes TAG=VALUE with TAG one of Type, Version, ProductName, "
+                         "ProductVersion, CompatibleProdVersion, ProductVersionString, "
+                         "Description, Path, CharEncoding; not " +
+                             Quote(tool::Shown(assignment)),
+                         command);
+    auto const wrong = [&](char const* what) {
+        return UsageError(tag + " takes " + what + ", not " + Quote(tool::Shown(value)), command);
+    };
+    char const* const section = IniHeader::kHeaderSectionName;
+    if (tag == IniHeader::kFormatVersionTag) {
+        long number = 0;
+        auto const r = std::from_chars(value.data(), value.data() + value.size(), number);
+        if (r.ec != std::errc() || r.ptr != value.data() + value.size())
+            throw wrong("a whole number");
+        header.Set(section, tag.c_str(), number);
+        return;
+    }
+    if ((tag == IniHeader::kProductVersionTag || tag == IniHeader::kCompatibleProductVersionTag) &&
+        !Version(value.c_str()).IsValid())
+        throw wrong("a version of up to four numbers such as 4.2.1.77");
+    if (tag == IniHeader::kCharEncodingTag && value != IniHeader::kSBCS.GetBufferReadPtr() &&
+        value != IniHeader::kDBCS.GetBufferReadPtr() &&
+        value != IniHeader::kUnicode.GetBufferReadPtr())
+        throw wrong("SBCS, DBCS or Unicode");
+    header.Set(section, tag.c_str(), value.c_str());
+}
+
+int RunHeader(Invocation const& call) {
+    RequireArguments(call, 1, 1, "ini header", "one FILE");
+    std::string const& file = call.arguments[0];
+    bool const editing = call.Has("--set");
+    if (editing)
+        RejectStandardInput(file, "ini header");
+    std::string text;
+    Ini const ini = Load(file, editing ? &text : nullptr);
+    IniHeader header(ini.Object());
+    if (editing) {
+        for (auto const& [option, assignment] : call.values)
+            if (option == "--set")
+                SetHeaderTag(header.GetIniObj(), assignment);
+        header.Write(ini.Object());
+        Save(ini, file, text, file);
+        return kSuccess;
+    }
+    if (!header.Exists())
+        throw ToolError(Shown(file) + ": no header section [" + IniHeader::kHeaderSectionName +
+                        "]");
+    Record record;
+    for (char const* tag : kHeaderTags) {
+        std::string_view const name = tag;
+        if (name == IniHeader::kFormatVersionTag)
+            record.AddNumber(tag, header.GetFormatVersion());
+        else if (name == IniHeader::kCharEncodingTag)
+            record.AddText(tag, header.GetCharacterEncoding().GetBufferReadPtr());
+        else {
+            DynamicString value;
+            header.GetIniObj().Get(IniHeader::kHeaderSectionName, tag, value);
+            record.AddText(tag, value.GetBufferReadPtr());
+        }
+    }
+    record.AddText("form", FormName(ini.form)).AddBool("valid", header.IsValid());
+    if (call.json)
+        std::cout << record.ToJson() << '\n';
+    else
+        record.PrintText(std::cout);
+    if (header.IsValid())
+        return kSuccess;
+    std::cerr << "tekit: " << Shown(file) << ": the header section is not valid\n";
+    return kFailure;
+}
+
 } // namespace
 
 CommandGroup const& IniGroup() {
@@ -801,6 +1047,18 @@ std::vector<Command> const& IniCommands() {
          kLintDetails,
          {},
          RunLint},
+        {"ini convert",
+         "Write an INI file in the text or one of the binary forms",
+         "tekit ini convert --to FORM IN OUT",
+         kConvertDetails,
+         {{"--to", "FORM"}},
+         RunConvert},
+        {"ini header",
+         "Show or set the header section of an INI file",
+         "tekit ini header [--json] [--set TAG=VALUE]... FILE",
+         kHeaderDetails,
+         {{"--set", "TAG=VALUE"}},
+         RunHeader},
     };
     return commands;
 }
