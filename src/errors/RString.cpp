@@ -1,7 +1,9 @@
 // RString and the global message table: texts by section and key, built-in or set at run time.
 #include "tekit/errors/RString.h"
 
+#include "errors/LoadedStrings.h"
 #include "errors/MessageCatalogue.h"
+#include "tekit/errors/Raise.h"
 #include "tekit/strings/StringVector.h"
 
 #include <deque>
@@ -41,6 +43,17 @@ public:
         s->second.insert_or_assign(std::string(key), &stored);
     }
 
+    void GetSections(StringVector& sections) const {
+        for (auto const& [section, keys] : m_sections)
+            sections.emplace_back(section.c_str());
+    }
+
+    /// Back to the built-in rows. The texts stay in m_texts, so RStrings keep valid pointers.
+    void RestoreBuiltInRows() {
+        m_sections.clear();
+        AddBuiltInRows();
+    }
+
     void GetKeys(std::string_view section, StringVector& keys) const {
         auto s = m_sections.find(section);
         if (s == m_sections.end())
@@ -73,6 +86,8 @@ struct GlobalTable {
     std::unique_ptr<MessageTable> table;
     TableState state = TableState::Untouched;
     bool ready = false;
+    /// The language whose strings files the table holds ("" none).
+    std::string language;
 };
 
 GlobalTable& Global() {
@@ -214,6 +229,7 @@ void RString::ResetStrings() {
     Global().table = std::make_unique<MessageTable>();
     Global().state = TableState::Managed;
     Global().ready = false;
+    Global().language.clear();
 }
 
 void RString::RemoveGlobalStringTable() {
@@ -221,6 +237,7 @@ void RString::RemoveGlobalStringTable() {
     Global().table.reset();
     Global().state = TableState::Managed;
     Global().ready = false;
+    Global().language.clear();
 }
 
 void RString::GetSectionTags(char const* section, StringVector& keys) {
@@ -231,10 +248,61 @@ void RString::GetSectionTags(char const* section, StringVector& keys) {
         Global().table->GetKeys(Text(section), keys);
 }
 
-void RString::SetString(char const* section, char const* key, char const* text) {
-    std::unique_lock lock(Global().mutex);
-    CreateTableLocked(Global()).Set(Text(section), Text(key), text ? text : "", true);
+void RString::GetSectionNames(StringVector& sections) {
+    sections.clear();
+    CreateOnFirstUse();
+    std::shared_lock lock(Global().mutex);
+    if (Global().table)
+        Global().table->GetSections(sections);
 }
+
+void RString::SetString(char const* section, char const* key, char const* text) {
+    if (!detail::EnterLoadedStrings(
+            {{std::string(Text(section)), std::string(Text(key)), std::string(Text(text))}},
+            detail::LoadMode::kAdd, nullptr))
+        detail::RaiseTableComplete("RString::SetString");
+}
+
+// ---- Strings files entering the table -----------------------------------------------------
+
+namespace detail {
+
+void RaiseTableComplete(char const* function) {
+    // Raised with no lock held: building the exception looks messages up in the table.
+    RString const text("ERR_DESCR", "STRINGS_TABLE_COMPLETE");
+    TE_RAISE(TE_OBJECT_LOCKED, static_cast<char const*>(text), function);
+}
+
+bool EnterLoadedStrings(std::vector<LoadedString> const& rows, LoadMode mode,
+                        char const* language) {
+    GlobalTable& global = Global();
+    std::unique_lock lock(global.mutex);
+    if (global.table && global.ready)
+        return false;
+    MessageTable& table = CreateTableLocked(global);
+    if (mode == LoadMode::kReplaceLoaded) {
+        table.RestoreBuiltInRows();
+        global.language = language ? language : "";
+    }
+    for (LoadedString const& row : rows)
+        table.Set(row.section, row.key, row.text.c_str(), true);
+    return true;
+}
+
+void UnloadStrings() {
+    GlobalTable& global = Global();
+    std::unique_lock lock(global.mutex);
+    CreateTableLocked(global).RestoreBuiltInRows();
+    global.ready = false;
+    global.language.clear();
+}
+
+std::string LoadedLanguage() {
+    std::shared_lock lock(Global().mutex);
+    return Global().language;
+}
+
+} // namespace detail
 
 // ---- Concatenation ------------------------------------------------------------------------
 

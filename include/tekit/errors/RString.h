@@ -6,10 +6,15 @@
 //   message.Format(path, 1);
 //
 // The table is created on first use with the library's built-in English rows; strings files
-// add rows or replace them (SetString). A found message points into the table and is not
+// add rows or replace them (UseStringsFile, RStringsLoader, SetString), until
+// FinishedLoadingStrings marks it complete. A found message points into the table and is not
 // owned: it stays valid until ResetStrings or RemoveGlobalStringTable, so an RString must not
 // outlive the table. A default text given by the caller is copied and owned by the RString.
 // Lookups are safe from any number of threads.
+//
+// Strings files are INI files (see tekit/ini/StringsFile.h): the two functions that read them
+// are defined with the INI store, which sits above this layer; declaring them needs nothing
+// from it.
 #pragma once
 
 #include "tekit/Export.h"
@@ -18,6 +23,7 @@
 
 namespace tekit {
 
+class Path;
 class StringVector;
 
 class TEKIT_API RString {
@@ -49,10 +55,27 @@ public:
     static void RemoveGlobalStringTable();
     /// Replaces `keys` by the keys of `section`, in ascending byte order.
     static void GetSectionTags(char const* section, StringVector& keys);
+    /// Replaces `sections` by the names of the table's sections, in ascending byte order.
+    static void GetSectionNames(StringVector& sections);
     /// Adds the row (section, key) or replaces its text: how a strings file enters the table.
     /// Sections and keys match exactly, case included. RStrings that refer to a replaced text
-    /// keep seeing it until the next ResetStrings or RemoveGlobalStringTable.
+    /// keep seeing it until the next ResetStrings or RemoveGlobalStringTable. Once
+    /// FinishedLoadingStrings has marked the table complete it is read-only: this raises
+    /// TE_OBJECT_LOCKED (-17349) until ResetStrings or RStringsLoader::UnloadAll.
     static void SetString(char const* section, char const* key, char const* text);
+
+    // ---- Strings files. ---------------------------------------------------------------------
+    /// Reads the strings file `file` (UTF-8 INI text: "[SECTION]" headers and "KEY = text"
+    /// lines) and enters all of its rows in one step; a bad file changes nothing. Raises the
+    /// file's system error (TE_FILE_NOT_FOUND, TE_ACCESS_DENIED, ...), TE_BAD_FILE_FORMAT
+    /// naming the file and line of the first problem, or TE_OBJECT_LOCKED when the table is
+    /// complete.
+    static void UseStringsFile(Path const& file);
+    /// Reads every strings file ("*.strings.ini", in byte order of the names, so a later file's
+    /// row replaces an earlier one's) of `directory` and enters their rows in one step: when one
+    /// file is bad none is entered. A directory that does not exist holds no files. `*count`
+    /// (when `count` is not null) receives the number of files entered.
+    static void UseAllStringsFilesInDirectory(Path const& directory, unsigned int* count);
 
 private:
     void CopyFrom(RString const& other);
