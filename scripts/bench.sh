@@ -49,4 +49,9 @@ if [[ -z "$filter" || exe_vs_objdump == *"$filter"* ]]; then
     echo "==== exe_vs_objdump"
     bench/exe_vs_objdump.sh build/release/tools/tekit/tekit || status=1
 fi
+# tekit info over a tree of 10 000 small product files: files per second.
+if [[ -z "$filter" || info_walk == *"$filter"* ]]; then
+    echo "==== info_walk"
+    bench/info_walk.sh build/release/tools/tekit/tekit || status=1
+fi
 exit $status

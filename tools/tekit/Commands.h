@@ -8,6 +8,7 @@
 #include <map>
 #include <stdexcept>
 #include <string>
+#include <utility>
 #include <vector>
 
 namespace tekit::tool {
@@ -33,6 +34,9 @@ struct OptionSpec {
 struct Invocation {
     std::vector<std::string> arguments;
     std::map<std::string, std::string> options;
+    /// Every option that takes a value, in command-line order, repeated ones included
+    /// (`options` keeps the last value of each).
+    std::vector<std::pair<std::string, std::string>> values;
     bool json = false;
 
     bool Has(std::string const& option) const { return options.count(option) != 0; }
@@ -61,6 +65,8 @@ std::vector<Command> const& ExeCommands();
 std::vector<Command> const& EnvCommands();
 std::vector<Command> const& IniCommands();
 std::vector<Command> const& CompressCommands();
+std::vector<Command> const& InfoCommands();
+std::vector<Command> const& StringsCommands();
 
 /// A word that gathers commands ("path" for "path check", ...): its own help.
 struct CommandGroup {
@@ -71,5 +77,6 @@ struct CommandGroup {
 CommandGroup const& PathGroup();
 CommandGroup const& VersionGroup();
 CommandGroup const& IniGroup();
+CommandGroup const& StringsGroup();
 
 } // namespace tekit::tool

@@ -50,10 +50,10 @@ Exit status:
 std::vector<Command> const& AllCommands() {
     static std::vector<Command> const commands = [] {
         std::vector<Command> all;
-        for (auto const* list : {&DemoCommands(), &ErrorCommands(), &PathCommands(),
-                                 &RangeCommands(), &VersionCommands(), &GrepCommands(),
-                                 &IniCommands(), &ExeCommands(), &EnvCommands(),
-                                 &CompressCommands()})
+        for (auto const* list :
+             {&DemoCommands(), &ErrorCommands(), &PathCommands(), &RangeCommands(),
+              &VersionCommands(), &GrepCommands(), &IniCommands(), &ExeCommands(), &EnvCommands(),
+              &CompressCommands(), &InfoCommands(), &StringsCommands()})
             all.insert(all.end(), list->begin(), list->end());
         return all;
     }();
@@ -61,8 +61,8 @@ std::vector<Command> const& AllCommands() {
 }
 
 std::vector<CommandGroup const*> const& AllGroups() {
-    static std::vector<CommandGroup const*> const groups{&PathGroup(), &VersionGroup(),
-                                                         &IniGroup()};
+    static std::vector<CommandGroup const*> const groups{&PathGroup(), &VersionGroup(), &IniGroup(),
+                                                         &StringsGroup()};
     return groups;
 }
 
