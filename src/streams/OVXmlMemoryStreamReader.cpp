@@ -506,16 +506,24 @@ public:
         ReadEndTag(name);
     }
 
-    template <class T, class Parse> T ReadTyped(char const* name, Parse parse, char const* key) {
+    /// Reads the value element `name` and hands its text, with where it starts and the name as
+    /// UTF-8, to `use`; the offset moves past the element only when `use` returns.
+    template <class Use> void ReadValueText(char const* name, Use use) {
         streams::Utf8Name const utf8(name, false);
         std::string storage;
         std::string_view text;
         std::uint32_t at = 0;
         ReadValue(utf8.view, text, storage, at);
-        T value{};
-        if (!parse(text, value))
-            Fail(at, key, text, utf8.view);
+        use(text, at, utf8.view);
         Commit();
+    }
+
+    template <class T, class Parse> T ReadTyped(char const* name, Parse parse, char const* key) {
+        T value{};
+        ReadValueText(name, [&](std::string_view text, std::uint32_t at, std::string_view utf8) {
+            if (!parse(text, value))
+                Fail(at, key, text, utf8);
+        });
         return value;
     }
 
@@ -739,25 +747,15 @@ bool OVXmlMemoryStream::ReadProcessingInstructionIfAny(DynamicString& target,
 // ---- Values. -----------------------------------------------------------------------------
 
 void OVXmlMemoryStream::ReadXml(char const* name, DynamicString& value) {
-    streams::Utf8Name const utf8(name, false);
-    Reader reader(*this);
-    std::string storage;
-    std::string_view text;
-    std::uint32_t at = 0;
-    reader.ReadValue(utf8.view, text, storage, at);
-    streams::AssignExact(value, text);
-    reader.Commit();
+    Reader(*this).ReadValueText(name, [&](std::string_view text, std::uint32_t, std::string_view) {
+        streams::AssignExact(value, text);
+    });
 }
 
 void OVXmlMemoryStream::ReadString(char const* name, DynamicString& value) {
-    streams::Utf8Name const utf8(name, false);
-    Reader reader(*this);
-    std::string storage;
-    std::string_view text;
-    std::uint32_t at = 0;
-    reader.ReadValue(utf8.view, text, storage, at);
-    streams::AssignFromUtf8(value, text);
-    reader.Commit();
+    Reader(*this).ReadValueText(name, [&](std::string_view text, std::uint32_t, std::string_view) {
+        streams::AssignFromUtf8(value, text);
+    });
 }
 
 int OVXmlMemoryStream::ReadInt(char const* name) {
