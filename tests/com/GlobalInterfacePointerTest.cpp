@@ -1,17 +1,22 @@
 // OVGlobalInterfacePointer: registration, the kept pointer of an optimized holder, fetching
 // from other threads, and the failures it reports.
-#include "CountedObject.h"
-
 #include "tekit/com/GlobalInterfacePointer.h"
-#include "tekit/errors/RString.h"
-
+#include "CountedObject.h"
+#include "platform/Thread.h"
 #include "support/Raises.h"
+#include "tekit/com/AsynchRefReleaser.h"
+#include "tekit/errors/RString.h"
+#include "tekit/sync/PerformanceOptions.h"
 
 #include <gtest/gtest.h>
 
+#include <atomic>
+#include <chrono>
 #include <cstring>
-#include <functional>
+#include <deque>
+#include <memory>
 #include <thread>
+#include <vector>
 
 namespace tekit {
 namespace {
@@ -19,17 +24,10 @@ namespace {
 using testing::ApartmentScope;
 using testing::CountedObject;
 using testing::kTestInterfaceId;
+using testing::OnOtherThread;
 
 constexpr HRESULT kObjectNotConnected = static_cast<HRESULT>(0x800401FD);
 constexpr HRESULT kNoInterface = static_cast<HRESULT>(0x80004002);
-
-/// Runs `body` on a new thread of the multithreaded apartment and waits for it.
-void OnOtherThread(std::function<void()> const& body) {
-    std::thread([&] {
-        ApartmentScope apartment;
-        body();
-    }).join();
-}
 
 class GlobalInterfacePointerTest : public ::testing::Test {
 protected:
@@ -48,16 +46,11 @@ TEST_F(GlobalInterfacePointerTest, KeptPointerIsHandedToTheRegisteringThreadAddi
     long const registered = m_object.Count();
     EXPECT_GT(registered, 1); // the table's reference and the kept one
 
-    struct Case {
-        bool addRef;
-        bool done;
-        long countChange;
-    };
-    for (Case const c : {Case{false, false, 0}, Case{true, true, 1}}) {
-        bool done = !c.done;
-        EXPECT_EQ(holder->GetLocalInterface(c.addRef, &done), static_cast<IUnknown*>(&m_object));
-        EXPECT_EQ(done, c.done);
-        EXPECT_EQ(m_object.Count(), registered + c.countChange);
+    for (bool const addRef : {false, true}) { // the done flag tells whether it added one
+        bool done = !addRef;
+        EXPECT_EQ(holder->GetLocalInterface(addRef, &done), static_cast<IUnknown*>(&m_object));
+        EXPECT_EQ(done, addRef);
+        EXPECT_EQ(m_object.Count(), registered + addRef);
         if (done)
             m_object.Release();
     }
@@ -146,6 +139,152 @@ TEST_F(GlobalInterfacePointerTest, FailedFetchExplainsLikelyCause) {
         holder.reset();
         EXPECT_EQ(m_object.Count(), 1);
     }
+}
+
+// AsynchRefReleaser: the opt-in, release on the worker thread, flushing, clean-up with work
+// still queued, and many threads handing holders over at once.
+using Holder = std::shared_ptr<OVGlobalInterfacePointer>;
+
+Holder Hold(CountedObject& object) {
+    return std::make_shared<OVGlobalInterfacePointer>(&object, kTestInterfaceId,
+                                                      DynamicString("ITest"), false, false, false);
+}
+
+/// Each test starts without a releaser and with asynchronous release as it asks. The options
+/// are set only while the releaser's thread is not running, as the library requires.
+class AsynchRefReleaserTest : public ::testing::Test {
+protected:
+    void SetUp() override { AsynchRefReleaser::Cleanup(); }
+    void TearDown() override {
+        AsynchRefReleaser::Cleanup();
+        gPerformanceOptions = m_savedOptions;
+    }
+    static void EnableAsynchronousRelease(bool on) {
+        gPerformanceOptions = on ? gPerformanceOptions | kPerformanceOptionAsynchronousRelease
+                                 : gPerformanceOptions & ~kPerformanceOptionAsynchronousRelease;
+    }
+
+    ApartmentScope m_apartment;
+    std::int32_t const m_savedOptions = gPerformanceOptions;
+    std::uint32_t const m_self = platform::CurrentThreadId();
+};
+
+TEST_F(AsynchRefReleaserTest, ReleaseHappensOnTheWorkerOnlyWhenOneRunsAndIsOptedIn) {
+    struct Case {
+        bool optIn, running;
+        DWORD flushed; // without a releaser a flush returns at once
+    };
+    for (Case const c : {Case{true, false, 0}, Case{false, true, WAIT_OBJECT_0},
+                         Case{true, true, WAIT_OBJECT_0}}) {
+        SCOPED_TRACE(::testing::Message() << "opted in " << c.optIn << ", running " << c.running);
+        AsynchRefReleaser::Cleanup(); // the options change only while no thread reads them
+        EnableAsynchronousRelease(c.optIn);
+        for (int i = 0; i < 2 * c.running; ++i)
+            AsynchRefReleaser::Initialize(); // a second call keeps the running releaser
+        AsynchRefReleaser::FlushAllReferencesNowInCallingThread(); // nothing queued, no failure
+        CountedObject object;
+        Holder holder = Hold(object);
+        AsynchRefReleaser::Release(holder);
+        EXPECT_EQ(holder, nullptr);
+        EXPECT_EQ(AsynchRefReleaser::FlushAllReferencesNow(INFINITE), c.flushed);
+        EXPECT_EQ(object.Count(), 1);
+        EXPECT_EQ(object.LastReleasingThread() == m_self, !(c.optIn && c.running));
+    }
+}
+
+/// Opts in, starts the releaser and holds its worker inside the first object's release while
+/// more holders queue behind it.
+struct StuckWorker {
+    std::atomic<bool> gate{false}, entered{false};
+    CountedObject first;
+    std::deque<CountedObject> queued{8};
+
+    void Start() {
+        gPerformanceOptions |= kPerformanceOptionAsynchronousRelease;
+        AsynchRefReleaser::Initialize();
+        Holder holder = Hold(first);
+        first.onRelease = [this] { // waits (up to 5 s) for the gate
+            entered = true;
+            auto const until = std::chrono::steady_clock::now() + std::chrono::seconds(5);
+            while (!gate && std::chrono::steady_clock::now() < until)
+                std::this_thread::sleep_for(std::chrono::milliseconds(1));
+        };
+        AsynchRefReleaser::Release(holder);
+        while (!entered)
+            std::this_thread::yield();
+        for (CountedObject& object : queued) {
+            Holder more = Hold(object);
+            AsynchRefReleaser::Release(more);
+        }
+    }
+    std::thread OpenGateLater() {
+        return std::thread([this] {
+            std::this_thread::sleep_for(std::chrono::milliseconds(50));
+            gate = true;
+        });
+    }
+};
+
+TEST_F(AsynchRefReleaserTest, FlushWaitsForTheWorkerAndTimesOutWhileItIsStuck) {
+    StuckWorker worker;
+    worker.Start();
+    EXPECT_EQ(AsynchRefReleaser::FlushAllReferencesNow(30), WAIT_TIMEOUT);
+    std::thread opener = worker.OpenGateLater();
+    EXPECT_EQ(AsynchRefReleaser::FlushAllReferencesNow(INFINITE), WAIT_OBJECT_0);
+    opener.join();
+    for (CountedObject const& object : worker.queued)
+        EXPECT_EQ(object.Count(), 1);
+}
+
+TEST_F(AsynchRefReleaserTest, CleanupReleasesWhatIsStillQueued) {
+    StuckWorker worker;
+    worker.Start();
+    std::thread opener = worker.OpenGateLater();
+    AsynchRefReleaser::Cleanup();
+    opener.join();
+    EXPECT_EQ(worker.first.Count(), 1);
+    for (CountedObject const& object : worker.queued) {
+        EXPECT_EQ(object.Count(), 1);
+        EXPECT_NE(object.LastReleasingThread(), m_self);
+    }
+    EXPECT_EQ(AsynchRefReleaser::FlushAllReferencesNow(INFINITE), 0u); // gone
+}
+
+TEST_F(AsynchRefReleaserTest, FlushInCallingThreadReleasesTheQueueThereAndAwaitsTheWorker) {
+    StuckWorker worker;
+    worker.Start();
+    worker.queued.back().onRelease = [&] { worker.gate = true; }; // the calling thread frees it
+    AsynchRefReleaser::FlushAllReferencesNowInCallingThread();
+    EXPECT_EQ(worker.first.Count(), 1); // the worker's own release has finished as well
+    for (CountedObject const& object : worker.queued) {
+        EXPECT_EQ(object.Count(), 1);
+        EXPECT_EQ(object.LastReleasingThread(), m_self);
+    }
+}
+
+TEST_F(AsynchRefReleaserTest,
+       ManyThreadsHandOverThousandsOfHoldersAndNothingLeaksOrIsReleasedTwice) {
+    constexpr int kThreads = 4;
+    constexpr int kPerThread = 2500;
+    EnableAsynchronousRelease(true);
+    AsynchRefReleaser::Initialize();
+    std::deque<CountedObject> objects(kThreads * kPerThread);
+    std::vector<std::thread> threads;
+    for (int t = 0; t < kThreads; ++t)
+        threads.emplace_back([&objects, t] {
+            ApartmentScope apartment;
+            for (int i = t * kPerThread; i < (t + 1) * kPerThread; ++i) {
+                Holder holder = Hold(objects[static_cast<std::size_t>(i)]);
+                AsynchRefReleaser::Release(holder);
+            }
+        });
+    for (std::thread& thread : threads)
+        thread.join();
+    ASSERT_EQ(AsynchRefReleaser::FlushAllReferencesNow(INFINITE), WAIT_OBJECT_0);
+    int wrong = 0; // left with a reference too many (leaked) or released twice
+    for (CountedObject const& object : objects)
+        wrong += object.Count() != 1 || object.OverReleased();
+    EXPECT_EQ(wrong, 0);
 }
 
 } // namespace

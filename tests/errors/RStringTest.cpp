@@ -1,5 +1,6 @@
+// Message tables (RString) and lookup strings.
 #include "tekit/errors/RString.h"
-
+#include "tekit/errors/LookupString.h"
 #include "tekit/strings/StaticString.h"
 #include "tekit/strings/StringVector.h"
 
@@ -15,8 +16,7 @@
 #include <utility>
 #include <vector>
 
-using namespace tekit;
-
+namespace tekit {
 namespace {
 
 /// Every test starts and ends with the built-in table.
@@ -34,8 +34,6 @@ std::vector<std::string> Keys(char const* section) {
         out.emplace_back(key.GetBufferReadPtr());
     return out;
 }
-
-} // namespace
 
 TEST_F(MessageTable, FoundMessageRefersIntoTheTableAndIsNotOwned) {
     bool found = false;
@@ -174,3 +172,35 @@ TEST_F(MessageTable, ManyThreadsLookUpWhileRowsAreAdded) {
     EXPECT_EQ(mismatches.load(), 0);
     EXPECT_STREQ(RString("LOAD", "KEY0"), "loaded");
 }
+
+TEST(LookupString, JoinsParentAndChildWithADot) {
+    StaticString<64> const parent("Locals");
+    DynamicString const child("Count", true);
+    EXPECT_STREQ(AddLookupStrings("Locals", "Count").GetBufferReadPtr(), "Locals.Count");
+    EXPECT_STREQ(AddLookupStrings(parent, "Count").GetBufferReadPtr(), "Locals.Count");
+    EXPECT_STREQ(AddLookupStrings("Locals", child).GetBufferReadPtr(), "Locals.Count");
+    EXPECT_STREQ(AddLookupStrings(parent, child).GetBufferReadPtr(), "Locals.Count");
+}
+
+TEST(LookupString, AnEmptyPartAddsNoSeparator) {
+    EXPECT_STREQ(AddLookupStrings("", "Count").GetBufferReadPtr(), "Count");
+    EXPECT_STREQ(AddLookupStrings("Locals", "").GetBufferReadPtr(), "Locals");
+    EXPECT_STREQ(AddLookupStrings(nullptr, nullptr).GetBufferReadPtr(), "");
+
+    DynamicString name;
+    AppendToLookupString(name, "Step");
+    AppendToLookupString(name, DynamicString("Result", true));
+    AppendToLookupString(name, "");
+    AppendToLookupString(name, nullptr);
+    EXPECT_STREQ(name.GetBufferReadPtr(), "Step.Result");
+}
+
+TEST(LookupString, AppendingIntoFixedStorageTruncatesInsteadOfOverflowing) {
+    StaticString<64> name("Parameters");
+    AppendToLookupString(name, std::string(100, 'x').c_str());
+    EXPECT_EQ(name.GetNumBytes(), 64);
+    EXPECT_EQ(std::string(name.GetBufferReadPtr()).substr(0, 11), "Parameters.");
+}
+
+} // namespace
+} // namespace tekit

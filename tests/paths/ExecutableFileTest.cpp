@@ -2,13 +2,13 @@
 #include "PEImageBuilder.h"
 #include "support/FaultInjection.h"
 #include "support/Raises.h"
+#include "support/ScratchDirectory.h"
 #include "tekit/paths/DependentModules.h"
 #include "tekit/paths/DynamicPath.h"
 #include "tekit/strings/StringVector.h"
 
 #include <filesystem>
 #include <fstream>
-#include <random>
 #include <string>
 
 using namespace tekit;
@@ -232,10 +232,6 @@ TEST(ExecutableFile, NamesWithoutTheirNulRaise) {
 class ExecutableFileOnDisk : public ::testing::Test {
 protected:
     void SetUp() override { fs::create_directories(m_root / "lib"); }
-    void TearDown() override {
-        std::error_code ignored; // a clean-up that fails must not hide the test's own result
-        fs::remove_all(m_root, ignored);
-    }
     std::string Write(std::string const& name, std::vector<unsigned char> const& bytes) {
         fs::path const path = m_root / name;
         std::ofstream(path, std::ios::binary)
@@ -255,8 +251,8 @@ protected:
             pe.AddImports(delayed, true);
         return pe.Build();
     }
-    fs::path const m_root =
-        fs::temp_directory_path() / ("tekit-exe-" + std::to_string(std::random_device()()));
+    tekit::testing::ScratchDirectory m_scratch{"exe"};
+    fs::path const m_root = m_scratch.Root();
 };
 
 TEST_F(ExecutableFileOnDisk, ReadsTheSameAsFromMemoryAndMapsSystemErrors) {

@@ -5,10 +5,16 @@
 #include "tekit/paths/PathVector.h"
 #include "tekit/strings/StringVector.h"
 
+#include <gtest/gtest.h>
+#if TEKIT_HAS_OLE
+#include <comdef.h> // the _bstr_t cases
+#endif
+
 #include <string>
 #include <utility>
 
-using namespace tekit;
+namespace tekit {
+namespace {
 
 TEST(PathStorage, FixedPathsCutAt260CharactersAndDynamicOnesKeepEverything) {
     std::string const text = "C:\\" + std::string(297, 'a');
@@ -107,3 +113,109 @@ TEST(PathInExceptions, HelpFileTravelsAsAPath) {
     e.GetWinHelpFile(helpFile);
     EXPECT_STREQ(helpFile.CStr(), "C:\\help\\station.chm");
 }
+
+using tekit::testing::TextOf;
+
+std::string Abbreviated(char const* text, int maxChars) {
+    return TextOf([&](String& out) { DynamicPath(text).GetAbbreviatedName(maxChars, out); });
+}
+
+std::string LongForm(char const* text) {
+    return TextOf(
+        [&](String& out) { PathBase::ConvertForLongPathCalls(DynamicString(text, true), out); });
+}
+
+TEST(PathAbbreviation, MiddleLevelsGiveWayFromTheFront) {
+    char const* const path = "C:\\first\\m1\\m2\\m3\\file.txt"; // 26 characters
+    EXPECT_EQ(Abbreviated(path, 26), path);
+    EXPECT_EQ(Abbreviated(path, 24), "C:\\first\\...\\m3\\file.txt");
+    EXPECT_EQ(Abbreviated(path, 21), "C:\\first\\...\\file.txt");
+    EXPECT_EQ(Abbreviated(path, 20), "C:\\...\\file.txt"); // then the first level goes too
+    EXPECT_EQ(Abbreviated("\\\\srv\\share\\a\\b\\c\\f.txt", 22), "\\\\srv\\share\\...\\f.txt");
+    EXPECT_EQ(Abbreviated("a\\b\\c\\d\\f.txt", 10), "...\\f.txt");
+}
+
+TEST(PathAbbreviation, ATooLongFileNameStandsAlone) {
+    EXPECT_EQ(Abbreviated("C:\\a\\b\\verylongname.txt", 10), "verylongname.txt");
+    EXPECT_EQ(Abbreviated("C:\\aaa\\bbb\\file12.txt", 16), "file12.txt"); // 10 + 4 + 3 >= 16
+    EXPECT_EQ(Abbreviated("C:\\a\\b", -1), "b");
+    EXPECT_EQ(Abbreviated("\\\\machine-name-only", 5), "machine-name-only");
+}
+
+TEST(PathAbbreviation, DirectoryTextsKeepTheirLastLevel) {
+    EXPECT_EQ(Abbreviated("C:\\first\\second\\third\\", 18), "C:\\...\\third\\");
+    EXPECT_EQ(Abbreviated("C:\\first\\a-very-long-last-level\\", 20), "a-very-long-last-level\\");
+}
+
+class PathAbbreviationMultiByte : public tekit::testing::MultiByteFixture {};
+
+TEST_F(PathAbbreviationMultiByte, CountsCharactersNotBytes) {
+    UseShiftJis();
+    // 14 characters, 19 bytes: fits in 14.
+    std::string const path = "C:\\\x82\xA0\x82\xA0\\\x82\xA0\x82\xA0\\\x82\xA0.txt";
+    EXPECT_EQ(Abbreviated(path.c_str(), 14), path);
+    EXPECT_EQ(Abbreviated(path.c_str(), 13), "C:\\...\\\x82\xA0.txt");
+}
+
+TEST(PathForwardSlashes, AbsolutePathsOnly) {
+    EXPECT_STREQ(Path("C:\\dir\\f.c").GetCRXStylePathString(), "/C/dir/f.c");
+    EXPECT_STREQ(Path("\\\\srv\\sh\\f").GetCRXStylePathString(), "//srv/sh/f");
+    EXPECT_STREQ(Path("\\dir").GetCRXStylePathString(), "");
+    // One buffer for every call: the next call overwrites the text.
+    char const* const first = Path("C:\\a").GetCRXStylePathString();
+    char const* const second = Path("D:\\b").GetCRXStylePathString();
+    EXPECT_EQ(first, second);
+    EXPECT_STREQ(first, "/D/b");
+}
+
+TEST(PathLongForm, PrefixesAreAddedWithoutLookingAtTheText) {
+    EXPECT_EQ(LongForm("C:\\dir\\f.txt"), "\\\\?\\C:\\dir\\f.txt");
+    EXPECT_EQ(LongForm("\\\\srv\\share\\f"), "\\\\?\\UNC\\srv\\share\\f");
+    EXPECT_EQ(LongForm("\\\\?\\C:\\f"), "\\\\?\\UNC\\?\\C:\\f"); // converted again
+    EXPECT_EQ(LongForm("rel/f"), "\\\\?\\rel/f");
+}
+
+TEST(PathLongForm, WideFormForTheSystemCalls) {
+    std::string const deep = "C:\\" + std::string(300, 'd') + "\\f";
+#if TEKIT_HAS_OLE
+    _bstr_t const wide = PathBase::ConvertForLongPathCalls(DynamicString(deep.c_str(), true));
+    std::wstring const text(static_cast<wchar_t const*>(wide), wide.length());
+#else
+    std::wstring const text = PathBase::ConvertForLongPathCalls(DynamicString(deep.c_str(), true));
+#endif
+    std::wstring const expected = L"\\\\?\\C:\\" + std::wstring(300, L'd') + L"\\f";
+    EXPECT_TRUE(text == expected);
+}
+
+#if defined(_WIN32)
+
+/// Width of `text` in the memory device context's default font, as the library measures it.
+long Width(char const* text) {
+    HDC const dc = CreateCompatibleDC(nullptr);
+    RECT area{0, 0, 0, 0};
+    DrawTextA(dc, text, -1, &area, DT_CALCRECT | DT_SINGLELINE | DT_NOPREFIX);
+    DeleteDC(dc);
+    return area.right - area.left;
+}
+
+std::string Fitted(Path const& path, long width, bool cutFileName) {
+    return TextOf(
+        [&](String& out) { path.GetAbbreviatedNameToFit(width, out, nullptr, cutFileName); });
+}
+
+TEST(PathAbbreviationToFit, ShortensToAPixelWidth) {
+    Path const path("C:\\first\\m1\\m2\\m3\\file.txt");
+    ASSERT_GT(Width("C:\\first\\...\\file.txt"), Width("C:\\...\\file.txt"));
+    EXPECT_EQ(Fitted(path, Width(path.CStr()), false), path.CStr());
+    EXPECT_EQ(Fitted(path, Width("C:\\first\\...\\m3\\file.txt"), false),
+              "C:\\first\\...\\m3\\file.txt");
+    EXPECT_EQ(Fitted(path, Width("C:\\...\\file.txt"), false), "C:\\...\\file.txt");
+    EXPECT_EQ(Fitted(path, 1, false), "file.txt");
+    std::string const cut = Fitted(path, Width("fil..."), true);
+    EXPECT_EQ(cut, "fil...");
+    EXPECT_EQ(Fitted(path, 0, true), "...");
+}
+#endif
+
+} // namespace
+} // namespace tekit

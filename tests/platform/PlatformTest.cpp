@@ -1,47 +1,21 @@
-// The operating-system seam: the same observable behaviour from each platform's implementation.
+// The operating-system seam: the same observable behaviour from each platform's implementation,
+// and loading shared modules and looking up their symbols, through the fault seam.
 #include "platform/CodePage.h"
 #include "platform/Environment.h"
-#include "platform/ErrorInfo.h"
+#include "platform/Module.h"
 #include "platform/SystemError.h"
 #include "platform/TextConversion.h"
-#include "platform/Thread.h"
+#include "support/FaultInjection.h"
 
 #include <gtest/gtest.h>
 
-#include <atomic>
 #include <cerrno>
 #include <cstdlib>
-#include <set>
 #include <string>
-#include <thread>
 #include <utility>
-#include <vector>
 
 namespace tekit::platform {
 namespace {
-
-TEST(ThreadIdTest, IsStableWithinAThreadAndDistinctAcrossLiveThreads) {
-    std::uint32_t const mine = CurrentThreadId();
-    EXPECT_EQ(CurrentThreadId(), mine);
-
-    // All threads stay alive until every id is taken, so no id can be reused.
-    constexpr int kThreads = 8;
-    std::vector<std::uint32_t> ids(kThreads);
-    std::vector<std::thread> threads;
-    std::atomic<int> taken{0};
-    for (int i = 0; i < kThreads; ++i)
-        threads.emplace_back([&, i] {
-            ids[i] = CurrentThreadId();
-            ++taken;
-            while (taken.load() < kThreads)
-                std::this_thread::yield();
-        });
-    for (auto& t : threads)
-        t.join();
-    std::set<std::uint32_t> distinct(ids.begin(), ids.end());
-    distinct.insert(mine);
-    EXPECT_EQ(distinct.size(), static_cast<size_t>(kThreads + 1));
-}
 
 void SetVariable(char const* name, char const* value) {
 #ifdef _WIN32
@@ -150,29 +124,58 @@ TEST(SystemErrorMessageTest, KnownCodesReadAsOneLineAndUnknownCodesAsTheirNumber
     EXPECT_EQ(SystemErrorMessage(0x8FFF1234u), "System error 0x8FFF1234");
 }
 
-constexpr GUID kSomeInterface = {0x12345678, 0x1234, 0x5678, {1, 2, 3, 4, 5, 6, 7, 8}};
+// Loading shared modules and looking up their symbols, through the fault seam.
+using testing::ScopedFault;
 
-TEST(ThreadErrorInfoTest, IsTakenOnceByTheThreadThatPublishedIt) {
-    std::string source = "x", description = "y";
-    while (GetThreadErrorInfo(source, description)) {
-    } // nothing left over from elsewhere
+#if defined(_WIN32)
+constexpr char kSystemModule[] = "kernel32.dll";
+constexpr char kSystemSymbol[] = "GetTickCount";
+constexpr char kMissingModule[] = "tekit-no-such-module.dll";
+#else
+constexpr char kSystemModule[] = "libc.so.6";
+constexpr char kSystemSymbol[] = "strlen";
+constexpr char kMissingModule[] = "libtekit-no-such-module.so";
+#endif
 
-    SetThreadErrorInfo(kSomeInterface, "Orvane.Engine", "The step failed.", 7, "help.chm");
-    bool seenElsewhere = true;
-    std::thread([&] {
-        std::string s, d;
-        seenElsewhere = GetThreadErrorInfo(s, d);
-    }).join();
-    EXPECT_FALSE(seenElsewhere);
+TEST(ModuleTest, ASystemModuleLoadsAndFindsItsSymbols) {
+    ModuleHandle module = nullptr;
+    ASSERT_FALSE(OpenModule(kSystemModule, module));
+    ASSERT_NE(module, nullptr);
+    void* address = nullptr;
+    EXPECT_FALSE(FindSymbol(module, kSystemSymbol, address));
+    EXPECT_NE(address, nullptr);
+    SystemError const missing = FindSymbol(module, "TekitNoSuchSymbol", address);
+    EXPECT_EQ(missing.code, native::kSymbolNotFound);
+    CloseModule(module);
+}
 
-    ASSERT_TRUE(GetThreadErrorInfo(source, description));
-    EXPECT_EQ(source, "Orvane.Engine");
-    EXPECT_EQ(description, "The step failed.");
-    EXPECT_FALSE(GetThreadErrorInfo(source, description));
+TEST(ModuleTest, AMissingModuleFailsWithTheLoadersReason) {
+    ModuleHandle module = nullptr;
+    std::string reason;
+    SystemError const error = OpenModule(kMissingModule, module, &reason);
+    EXPECT_EQ(error.code, native::kModuleNotFound);
+    EXPECT_EQ(module, nullptr);
+    EXPECT_FALSE(reason.empty());
+}
 
-    SetThreadErrorInfo(kSomeInterface, nullptr, nullptr, 0, nullptr); // null texts: empty texts
-    ASSERT_TRUE(GetThreadErrorInfo(source, description));
-    EXPECT_EQ(source + description, "");
+TEST(ModuleTest, ArmedLoadsAndLookupsFailWithTheInjectedError) {
+    ModuleHandle module = nullptr;
+    {
+        ScopedFault const fault(FaultKind::ModuleLoad, 1, native::kModuleNotFound);
+        std::string reason;
+        SystemError const error = OpenModule(kSystemModule, module, &reason);
+        EXPECT_EQ(error.code, native::kModuleNotFound);
+        EXPECT_EQ(module, nullptr);
+        EXPECT_FALSE(reason.empty());
+        ASSERT_FALSE(OpenModule(kSystemModule, module)); // only the first call fails
+    }
+    {
+        ScopedFault const fault(FaultKind::SymbolLookup, 1, native::kSymbolNotFound);
+        void* address = nullptr;
+        EXPECT_EQ(FindSymbol(module, kSystemSymbol, address).code, native::kSymbolNotFound);
+        EXPECT_EQ(address, nullptr);
+    }
+    CloseModule(module);
 }
 
 } // namespace

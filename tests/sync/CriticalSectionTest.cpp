@@ -1,8 +1,8 @@
-// The lock interface's defaults and the recursive critical sections, UI-aware ones included.
+// The lock interface's defaults, the recursive critical sections (UI-aware ones included) and
+// the reader-writer lock: recursion, the refusal of a repeated shared request, ownership
+// queries, and readers and writers at full contention.
 #include "OtherThread.h"
-
 #include "sync/CriticalSectionObjects.h"
-
 #include "tekit/sync/CriticalSections.h"
 #include "tekit/sync/Interlock.h"
 #include "tekit/sync/LWAwareCriticalSection.h"
@@ -10,7 +10,11 @@
 
 #include <gtest/gtest.h>
 
+#include <atomic>
+#include <cstdint>
 #include <memory>
+#include <thread>
+#include <utility>
 #include <vector>
 
 namespace tekit {
@@ -78,37 +82,26 @@ TEST(Lockable, EveryLockIsExclusiveAndRecursiveForItsWriterButNotItsReader) {
     }
 }
 
-struct UnlockCall {
-    bool aboutToRelease;
-    std::uint32_t ownerDuringCall;
-};
-
-struct CallbackLog {
-    TestObjectArrayCriticalSectionThatAlwaysHasOnUnlock* section = nullptr;
-    std::vector<UnlockCall> calls;
-};
-
-void RecordUnlock(void* context, bool aboutToRelease) {
-    auto* log = static_cast<CallbackLog*>(context);
-    log->calls.push_back({aboutToRelease, log->section->GetThreadId()});
-}
-
 TEST(CriticalSection, UnlockCallbackRunsTwiceAroundTheOutermostReleaseOnly) {
-    TestObjectArrayCriticalSectionThatAlwaysHasOnUnlock section;
-    CallbackLog log{&section, {}};
-    section.SetOnUnlockCallback(&RecordUnlock, &log);
-    section.Lock(kExclusiveAccess, 0);
-    section.Lock(kSharedAccess, 0);
-    ASSERT_TRUE(section.TryLock(kExclusiveAccess, 0));
-    section.Unlock(kExclusiveAccess);
-    section.Unlock(kExclusiveAccess);
+    using Calls = std::vector<std::pair<bool, std::uint32_t>>; // about to release, owner then
+    struct {
+        TestObjectArrayCriticalSectionThatAlwaysHasOnUnlock section;
+        Calls calls;
+    } log;
+    log.section.SetOnUnlockCallback(
+        [](void* context, bool aboutToRelease) {
+            auto* self = static_cast<decltype(&log)>(context);
+            self->calls.emplace_back(aboutToRelease, self->section.GetThreadId());
+        },
+        &log);
+    log.section.Lock(kExclusiveAccess, 0);
+    log.section.Lock(kSharedAccess, 0);
+    ASSERT_TRUE(log.section.TryLock(kExclusiveAccess, 0));
+    for (int i = 0; i < 2; ++i)
+        log.section.Unlock(kExclusiveAccess);
     EXPECT_TRUE(log.calls.empty());
-    section.Unlock(kExclusiveAccess);
-    std::uint32_t const self = detail::CurrentLockThreadId();
-    ASSERT_EQ(log.calls.size(), 2u);
-    EXPECT_TRUE(log.calls[0].aboutToRelease);
-    EXPECT_EQ(log.calls[0].ownerDuringCall, self) << "still held during the first call";
-    EXPECT_EQ(log.calls[1].ownerDuringCall, 0u) << "already released during the second";
+    log.section.Unlock(kExclusiveAccess);
+    EXPECT_EQ(log.calls, (Calls{{true, detail::CurrentLockThreadId()}, {false, 0}}));
 }
 
 TEST(CriticalSection, OnlyAGlobalSectionLeavesItsSystemObjectAlive) {
@@ -135,6 +128,93 @@ TEST(LockPools, PoolsAndCountersAreReadyAtLoad) {
     EXPECT_EQ(gPerformanceOptions, 0);
     EXPECT_EQ(gRWLockContentionCount + gRWLockShareCount + gRWLockSleepCount + gRWLockTotalCount,
               0);
+}
+
+// The reader-writer lock: recursion, the refusal of a repeated shared request, ownership
+// queries, and readers and writers at full contention.
+/// Exposes the single attempt that Lock and TryLock are built on.
+class ProbedLock : public RWLock<kUltraFiniteLockLevel> {
+public:
+    using RWLock::InternalTryLock;
+};
+
+TEST(RWLock, WriterTakesItAgainSharedOrExclusiveAndFreesItAfterAsManyReleases) {
+    ProbedLock lock;
+    ASSERT_TRUE(lock.Lock(kExclusiveAccess, 0));
+    ASSERT_TRUE(lock.Lock(kSharedAccess, 0));
+    ASSERT_EQ(lock.InternalTryLock(kSharedAccess, 0), kTryLockAcquired);
+    ASSERT_TRUE(lock.TryLock(kExclusiveAccess, 0));
+    LockAccessType const releases[] = {kSharedAccess, kExclusiveAccess, kSharedAccess};
+    for (LockAccessType const access : releases) {
+        lock.Unlock(access);
+        EXPECT_FALSE(OtherThreadCanTake(lock, kSharedAccess));
+        EXPECT_EQ(lock.CurrentThreadOwnsLock(kExclusiveAccess), kOwnsLockExclusively);
+    }
+    lock.Unlock(kExclusiveAccess);
+    EXPECT_TRUE(OtherThreadCanTake(lock, kExclusiveAccess));
+}
+
+TEST(RWLock, NewestReaderAskingAgainIsRefusedAtOnceUntilAnotherReaderReleases) {
+    ProbedLock lock;
+    ASSERT_TRUE(lock.Lock(kSharedAccess, 0));
+    EXPECT_EQ(lock.InternalTryLock(kSharedAccess, 0), kTryLockRefused);
+    EXPECT_FALSE(lock.Lock(kSharedAccess, 0)) << "refused, not waiting";
+
+    // Another reader's release forgets the newest reader: the repeat is then counted.
+    OnOtherThread([&] {
+        ASSERT_TRUE(lock.Lock(kSharedAccess, 0));
+        lock.Unlock(kSharedAccess);
+    });
+    ASSERT_TRUE(lock.Lock(kSharedAccess, 0));
+    EXPECT_EQ(lock.GetThreadId(), std::uint32_t(-2));
+    lock.Unlock(kSharedAccess);
+    lock.Unlock(kSharedAccess);
+}
+
+TEST(RWLock, OwnershipAsSeenByReadersWritersAndOthers) {
+    ProbedLock lock;
+    std::atomic<int> phase{0};
+    EXPECT_EQ(lock.CurrentThreadOwnsLock(kEitherAccess), kDoesNotOwnLock);
+
+    // Two other threads read at once: the count is 2, and nobody can tell who reads.
+    std::vector<std::thread> readers;
+    for (int i = 0; i < 2; ++i)
+        readers.emplace_back([&] {
+            lock.Lock(kSharedAccess, 0);
+            phase.fetch_add(1);
+            while (phase.load() < 3)
+                std::this_thread::yield();
+            lock.Unlock(kSharedAccess);
+        });
+    while (phase.load() < 2)
+        std::this_thread::yield();
+    EXPECT_EQ(lock.GetThreadId(), 0xFFFFFFFEu);
+    EXPECT_EQ(lock.CurrentThreadOwnsLock(kEitherAccess), kLockHeldShared);
+    EXPECT_EQ(lock.CurrentThreadOwnsLock(kExclusiveAccess), kDoesNotOwnLock);
+    EXPECT_EQ(lock.InternalTryLock(kExclusiveAccess, 0), kTryLockBusy);
+    phase = 3;
+    for (std::thread& reader : readers)
+        reader.join();
+
+    lock.Lock(kExclusiveAccess, 0);
+    for (LockAccessType const access : {kSharedAccess, kExclusiveAccess, kEitherAccess})
+        EXPECT_EQ(lock.CurrentThreadOwnsLock(access), kOwnsLockExclusively);
+    OnOtherThread([&] { EXPECT_EQ(lock.InternalTryLock(kSharedAccess, 0), kTryLockBusy); });
+    lock.Unlock(kExclusiveAccess);
+}
+
+#if defined(__SANITIZE_THREAD__)
+constexpr int kStressOperations = 20000; // the race detector is some twenty times slower
+#else
+constexpr int kStressOperations = 200000;
+#endif
+
+TEST(RWLockStress, ReadersNeverSeeAHalfWrittenPairWhenYieldingOrSpinning) {
+    OVCriticalSection lock;
+    ExpectExclusion(lock, 4, kStressOperations);
+    gPerformanceOptions |= kPerformanceOptionSpinningLocks;
+    ExpectExclusion(lock, 4, kStressOperations / 4);
+    gPerformanceOptions &= ~kPerformanceOptionSpinningLocks;
 }
 
 } // namespace

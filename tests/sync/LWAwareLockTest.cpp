@@ -1,5 +1,7 @@
 // The UI-aware locks and waits as every thread that owns no frame window sees them: exclusion,
 // recursion, one wake per hand-over, one wait event per lock, and the wait results and times.
+#include "OtherThread.h"
+
 #include "sync/UIThreads.h"
 
 #include "tekit/sync/LWAwareCriticalSection.h"
@@ -69,27 +71,9 @@ TEST(LWAwareCriticalSectionImplementation, EachHandOverToAWaiterSignalsOnce) {
 }
 
 TEST(LWAwareCriticalSectionImplementation, ContendingThreadsExcludeEachOtherAndShareOneEvent) {
-    constexpr int kThreads = 4;
-    constexpr int kRounds = 2000;
     LWAwareCriticalSectionImplementation lock;
     std::uint32_t const events = detail::LockWaitEventsCreated();
-    long counter = 0; // plain: only the lock protects it
-    std::atomic<int> inside{0}, overlaps{0};
-    std::vector<std::thread> threads;
-    for (int t = 0; t < kThreads; ++t)
-        threads.emplace_back([&] {
-            for (int i = 0; i < kRounds; ++i) {
-                lock.Lock(kExclusiveAccess, 0);
-                overlaps += inside.fetch_add(1) != 0;
-                ++counter;
-                inside.fetch_sub(1);
-                lock.Unlock(kExclusiveAccess);
-            }
-        });
-    for (std::thread& thread : threads)
-        thread.join();
-    EXPECT_EQ(counter, long{kThreads} * kRounds);
-    EXPECT_EQ(overlaps, 0);
+    ExpectExclusion(lock, 4, 2000);
     EXPECT_LE(detail::LockWaitEventsCreated() - events, 1u);
     HANDLE const event = lock.GetWaitForLockEvent();
     EXPECT_EQ(lock.GetWaitForLockEvent(), event);

@@ -11,7 +11,6 @@
 #include <chrono>
 #include <cstdlib>
 #include <memory>
-#include <new>
 #include <random>
 #include <string>
 #include <thread>
@@ -75,14 +74,6 @@ TEST(Mutex, UnnamedMutexIsPrivateToItsObject) {
         EXPECT_TRUE(HeldElsewhere(first));
         EXPECT_FALSE(HeldElsewhere(second));
     }).join();
-}
-
-TEST(Mutex, ThreadThatEndsHoldingItLeavesItAbandonedAndAcquirable) {
-    Mutex mutex(UniqueName("abandoned").c_str());
-    // The lock lives in static storage and is never destroyed: its thread ends holding it.
-    alignas(MutexLock) static unsigned char storage[sizeof(MutexLock)];
-    std::thread([&] { ::new (storage) MutexLock(mutex, 0); }).join();
-    EXPECT_NO_THROW(MutexLock(mutex, 5000));
 }
 
 // The child half of the test below, run in a process of its own: takes the mutex, waits for

@@ -1,10 +1,15 @@
-// Doing something on another thread while the calling thread holds a lock.
+// Doing something on another thread while the calling thread holds a lock, and many threads
+// contending for one lock.
 #pragma once
 
 #include "tekit/sync/CriticalSections.h"
 
+#include <gtest/gtest.h>
+
+#include <atomic>
 #include <functional>
 #include <thread>
+#include <vector>
 
 namespace tekit {
 
@@ -22,6 +27,38 @@ inline bool OtherThreadCanTake(Lockable& lock, LockAccessType access) {
             lock.Unlock(access);
     });
     return taken;
+}
+
+/// Readers and writers over a pair that a writer changes in two steps, the second under a
+/// nested shared request: a reader that ever sees the halves differ, or a final count short of
+/// the writes, found a hole in the lock's exclusion.
+inline void ExpectExclusion(Lockable& lock, int threads, int operations) {
+    long long first = 0, second = 0; // plain: only the lock protects them
+    std::atomic<long long> torn{0}, writes{0};
+    std::vector<std::thread> workers;
+    for (int t = 0; t < threads; ++t)
+        workers.emplace_back([&, t] {
+            for (int i = 0; i < operations; ++i) {
+                if ((i + t) % 5 == 0) { // one operation in five writes
+                    ASSERT_TRUE(lock.Lock(kExclusiveAccess, 0));
+                    ++first;
+                    ASSERT_TRUE(lock.Lock(kSharedAccess, 0)); // the writer's shared request
+                    ++second;
+                    lock.Unlock(kSharedAccess);
+                    lock.Unlock(kExclusiveAccess);
+                    writes.fetch_add(1, std::memory_order_relaxed);
+                } else {
+                    ASSERT_TRUE(lock.Lock(kSharedAccess, 0));
+                    if (first != second)
+                        torn.fetch_add(1, std::memory_order_relaxed);
+                    lock.Unlock(kSharedAccess);
+                }
+            }
+        });
+    for (std::thread& worker : workers)
+        worker.join();
+    EXPECT_EQ(torn.load(), 0);
+    EXPECT_EQ(second, writes.load());
 }
 
 } // namespace tekit

@@ -1,6 +1,9 @@
+// Handles, and the lists in their blocks: layout, growth, positions, search, sorting, walks.
 #include "tekit/toolbox/List.h"
 #include "tekit/toolbox/Compare.h"
+#include "tekit/toolbox/Sort.h"
 
+#include "toolbox/HandleAssert.h"
 #include "toolbox/ListBlock.h"
 
 #include <gtest/gtest.h>
@@ -10,6 +13,10 @@
 #include <cstdlib>
 #include <cstring>
 #include <limits>
+#include <random>
+#include <stdexcept>
+#include <string>
+#include <utility>
 #include <vector>
 
 namespace {
@@ -52,15 +59,49 @@ struct ListTest : ::testing::Test {
     ListType list = Make();
 };
 
-TEST_F(ListTest, NewListBlockIsHeaderAndSpareBytes) {
+// Blocks start and grow zero-filled; size 0 has no block.
+TEST(HandleTest, BlocksAreZeroFilledAndKeepTheirContentWhenResized) {
+    Handle h = NewHandle(4), empty = NewHandle(0);
+    EXPECT_EQ(empty->block, nullptr);
+    EXPECT_EQ(std::memcmp(h->block, "\0\0\0\0", 4), 0);
+    std::memcpy(h->block, "abcd", 4);
+    ASSERT_EQ(SetHandleSize(h, 4096), 1);
+    EXPECT_EQ(GetHandleSize(h), 4096u);
+    EXPECT_EQ(std::string(static_cast<char*>(h->block), 4096), "abcd" + std::string(4092, '\0'));
+    ASSERT_EQ(SetHandleSize(h, 2), 1); // shrink, then grow again: no stale bytes come back
+    ASSERT_EQ(SetHandleSize(h, 4), 1);
+    EXPECT_EQ(std::memcmp(h->block, "ab\0\0", 4), 0);
+    ASSERT_EQ(SetHandleSize(h, 0), 1);
+    EXPECT_EQ(h->block, nullptr);
+    DisposeHandle(h);
+    DisposeHandle(empty);
+    DisposeHandle(nullptr); // ignored
+}
+
+TEST(HandleTest, AssertTextNamesMessageLineAndFile) {
+    EXPECT_EQ(
+        tekit::toolbox::AssertText("Parameter 1 to GetHandleSize was NULL.", 42, "Handle.cpp"),
+        "Assert!\n\nParameter 1 to GetHandleSize was NULL.\n\nThe error was detected on "
+        "line 42 of file 'Handle.cpp'.\n\nProgram aborting.");
+}
+
+// On Windows the text goes to a message box, which would wait for a click.
+#if !defined(_WIN32)
+TEST(HandleDeathTest, NullHandleAbortsWithTheAssertText) {
+    GTEST_FLAG_SET(death_test_style, "threadsafe");
+    EXPECT_DEATH(GetHandleSize(nullptr),
+                 "Assert!\n\nParameter 1 to GetHandleSize was NULL.\n\nThe error was detected on "
+                 "line [0-9]+ of file 'Handle.cpp'.\n\nProgram aborting.");
+    EXPECT_DEATH(SetHandleSize(nullptr, 4), "Parameter 1 to SetHandleSize was NULL.");
+}
+#endif
+
+// A new list is the header and the spare bytes. The policy step adds (100 + 10) percent of the
+// capacity, at least 4 slots; a single insertion into a full list asks for one slot more.
+TEST_F(ListTest, NewBlockAndGrowthFollowTheCapacitySequences) {
     EXPECT_EQ(GetHandleSize(list), 28u);
     EXPECT_EQ(HeaderFields(list), (Fields{0x4C495354, 10, 4, 0, 4, 0}));
     EXPECT_EQ(ListGetDataPtr(list), static_cast<char*>(list->block) + 24);
-}
-
-// The policy step adds (100 + 10) percent of the capacity, at least 4 slots; a single insertion
-// into a full list asks for one slot more than the step.
-TEST_F(ListTest, GrowthFollowsTheCapacitySequences) {
     ListType grown = Make();
     Fields inserted, stepped{Capacity(grown)};
     for (int i = 0; i < 60; ++i) {
@@ -203,21 +244,29 @@ TEST_F(ListTest, FindAndInsertRelativeToAnItem) {
     EXPECT_EQ(Items(found), (Ints{4, 5, 8, 7, 5, 8, 9, 9}));
 }
 
-TEST_F(ListTest, OrderedInsertionKeepsOrderAndGoesBeforeAnEqualItem) {
-    for (int n : {0, 1, 6, 7, 8, 13, 100}) { // below and above the linear finish
+// The list's search and ordered insertion share BinSearch: below and above its linear finish
+// (under 7 entries) every key finds its entry, or its insertion point encoded as -point - 1.
+TEST_F(ListTest, BinarySearchesFindTheEntryOrTheInsertionPoint) {
+    for (int n : {0, 1, 5, 6, 7, 8, 13, 50}) {
         Ints values;
         for (int i = 0; i < n; ++i)
-            values.push_back(2 * i);
-        for (int key = -1; key <= 2 * n; ++key) {
+            values.push_back(10 * i);
+        for (int key = -5; key <= 10 * n + 5; key += 5) {
+            SCOPED_TRACE(testing::Message() << "n=" << n << " key=" << key);
+            int const at =
+                int(std::lower_bound(values.begin(), values.end(), key) - values.begin());
+            bool const found = key % 10 == 0 && key >= 0 && key < 10 * n;
+            EXPECT_EQ(BinSearch(values.data(), n, sizeof(int), &key, IntCompare),
+                      found ? at : -at - 1);
             ListType sorted = Make(values);
-            bool const present = key % 2 == 0 && key >= 0 && key < 2 * n;
-            EXPECT_EQ(ListBinSearch(sorted, &key, IntCompare), present ? key / 2 + 1 : 0);
+            EXPECT_EQ(ListBinSearch(sorted, &key, IntCompare), found ? at + 1 : 0);
             ASSERT_EQ(ListInsertInOrder(sorted, &key, IntCompare), 1);
             Ints expected = values;
-            expected.insert(std::lower_bound(expected.begin(), expected.end(), key), key);
-            ASSERT_EQ(Items(sorted), expected) << "n=" << n << " key=" << key;
+            expected.insert(expected.begin() + at, key);
+            ASSERT_EQ(Items(sorted), expected);
         }
     }
+    EXPECT_EQ(BinSearch(nullptr, 3, 4, "key", IntCompare), -1);
 }
 
 TEST_F(ListTest, IsSortedRemoveDuplicatesAndSort) {
@@ -290,11 +339,108 @@ TEST_F(ListTest, ThrowingCallbackDoesNotEscape) {
 
 TEST(ListDisposeTest, PointerListFreesEachItem) {
     ListType list = ListCreate(sizeof(void*));
-    for (int i = 0; i < 3; ++i) {
-        void* owned = std::malloc(16);
+    for (void* owned : {std::malloc(16), std::malloc(16)})
         ListInsertItem(list, &owned, LIST_POS_END);
-    }
     ListDisposePtrList(list); // the leak checker of the sanitizer build sees the rest
+}
+
+/// A 12-byte record ordered by its key only (IntCompare reads the first field), so stability
+/// and payload moves are visible.
+struct Record {
+    int key, order, check;
+};
+
+using SortFunction = std::int32_t(TEKIT_STDCALL*)(void*, std::int32_t, std::int32_t,
+                                                  CompareFunction);
+std::pair<char const*, SortFunction> const kSorts[] = {
+    {"heap", HeapSort}, {"quick", QuickSort}, {"insertion", InsertionSort}};
+
+std::vector<int> Data(std::size_t n, int range, unsigned seed) {
+    std::mt19937 random(seed);
+    std::uniform_int_distribution<int> value(-range, range);
+    std::vector<int> data(n);
+    for (int& v : data)
+        v = value(random);
+    return data;
+}
+
+TEST(SortTest, AgreesWithStdSortOnRandomSortedReversedAndEqualKeys) {
+    for (auto const& [name, sort] : kSorts) {
+        for (std::size_t n : {0u, 1u, 2u, 3u, 16u, 17u, 100u, 2000u}) {
+            for (int range : {0, 3, 1000000}) { // all equal, many equal, mostly distinct
+                std::vector<std::vector<int>> inputs{Data(n, range, unsigned(n + range))};
+                inputs.push_back(inputs[0]);
+                std::sort(inputs[1].begin(), inputs[1].end());
+                inputs.push_back(inputs[1]);
+                std::reverse(inputs[2].begin(), inputs[2].end());
+                for (auto data : inputs) {
+                    std::vector<int> expected = data;
+                    std::sort(expected.begin(), expected.end());
+                    ASSERT_EQ(sort(data.data(), std::int32_t(n), sizeof(int), IntCompare), 1);
+                    ASSERT_EQ(data, expected) << name << " n=" << n << " range=" << range;
+                }
+            }
+        }
+    }
+}
+
+TEST(SortTest, LargeItemsMoveWholeAndNullComparisonOrdersByUnsignedBytes) {
+    for (auto const& [name, sort] : kSorts) {
+        std::vector<Record> records;
+        for (int i = 0; i < 500; ++i)
+            records.push_back({(i * 7919) % 37, i, (i * 7919) % 37 * 31 + 1});
+        ASSERT_EQ(sort(records.data(), 500, sizeof(Record), IntCompare), 1);
+        for (std::size_t i = 1; i < records.size(); ++i) {
+            Record const &before = records[i - 1], &r = records[i];
+            ASSERT_EQ(r.check, r.key * 31 + 1) << name;
+            ASSERT_LE(before.key, r.key) << name;
+            // Insertion sort is stable: equal keys keep their order.
+            ASSERT_TRUE(sort != InsertionSort || before.key < r.key || before.order < r.order);
+        }
+        std::string bytes = "pear\xFF\x01zzapplpea\x80Zulupear"; // six items of four bytes
+        ASSERT_EQ(sort(bytes.data(), 6, 4, nullptr), 1);
+        EXPECT_EQ(bytes, "Zuluapplpearpearpea\x80\xFF\x01zz") << name;
+    }
+}
+
+TEST(SortTest, BadArgumentsAndThrowingComparisonsFailKeepingTheItems) {
+    for (auto const& [name, sort] : kSorts) {
+        std::vector<int> data = Data(200, 1000, 5);
+        std::vector<int> items = data;
+        EXPECT_EQ(sort(nullptr, 3, 4, IntCompare) + sort(data.data(), -1, 4, IntCompare) +
+                      sort(data.data(), 3, 0, IntCompare),
+                  0)
+            << name;
+        EXPECT_EQ(data, items);
+        static int calls;
+        calls = 0;
+        auto throwing = [](void const* a, void const* b) -> int {
+            if (++calls == 150)
+                throw std::runtime_error("stop");
+            return IntCompare(a, b);
+        };
+        EXPECT_EQ(sort(data.data(), 200, sizeof(int), throwing), 0) << name;
+        std::sort(data.begin(), data.end());
+        std::sort(items.begin(), items.end());
+        EXPECT_EQ(data, items) << name;
+    }
+}
+
+/// Records each probe, to show which entries the search looks at.
+std::vector<int> gProbes;
+int TEKIT_CDECL RecordingCompare(void const* key, void const* item) {
+    gProbes.push_back(*static_cast<int const*>(item));
+    return IntCompare(key, item);
+}
+
+TEST(BinSearchTest, HalvesSevenOrMoreEntriesAndWalksFewer) {
+    std::vector<int> const seven{0, 1, 2, 3, 4, 5, 6};
+    int const five = 5, low = -1;
+    EXPECT_EQ(BinSearch(seven.data(), 6, sizeof(int), &five, RecordingCompare), 5);
+    EXPECT_EQ(gProbes, (std::vector<int>{0, 1, 2, 3, 4, 5}));
+    gProbes.clear();
+    EXPECT_EQ(BinSearch(seven.data(), 7, sizeof(int), &low, RecordingCompare), -1);
+    EXPECT_EQ(gProbes, (std::vector<int>{3, 0}));
 }
 
 } // namespace
