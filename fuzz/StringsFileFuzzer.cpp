@@ -60,6 +60,7 @@ extern "C" int LLVMFuzzerTestOneInput(std::uint8_t const* data, std::size_t size
             tekit::RString const text(file.GetSection(i), file.GetKey(i), nullptr, &found);
             Check(found && std::strcmp(text, file.GetText(i)) == 0);
         }
+        tekit::RString::ResetStrings(); // the next input's messages come from the built-in rows
     }
     tekit::String::EnableMultiByteSupport(false);
     tekit::SetMultiByteCodePage(0);

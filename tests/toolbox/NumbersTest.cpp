@@ -135,7 +135,6 @@ TEST(UnitConversions, UseTheDocumentedFactorsAndOperations) {
     };
     for (auto const& c : cases)
         EXPECT_EQ(c.function(c.argument), c.result) << c.argument;
-    EXPECT_NE(FeetToMeters(1.0), 0.3048);
 }
 
 } // namespace
