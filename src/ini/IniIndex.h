@@ -64,13 +64,11 @@ int Compare(IndexEntry const& entry, NameOf const& nameOf, std::uint32_t prefix,
 }
 
 inline IndexEntry* Entries(SortedIndex const& index) {
-    toolbox::ListHeader* const header = toolbox::HeaderOf(index.list);
-    return header ? reinterpret_cast<IndexEntry*>(toolbox::ItemsOf(header)) : nullptr;
+    return toolbox::ItemsAs<IndexEntry>(index.list);
 }
 
 inline std::int32_t Count(SortedIndex const& index) {
-    toolbox::ListHeader* const header = toolbox::HeaderOf(index.list);
-    return header ? header->numItems : 0;
+    return toolbox::ItemCountOf(index.list);
 }
 
 inline std::uint32_t CommonLength(char const* a, char const* b, std::uint32_t limit) {

@@ -110,20 +110,16 @@ inline bool IsValid(IniSection section) {
 
 // The lists' items, reached without a call: lookups make many of these.
 inline Item* ItemsOf(IniSectionRec const& section) {
-    toolbox::ListHeader* const header = toolbox::HeaderOf(section.items);
-    return header ? reinterpret_cast<Item*>(toolbox::ItemsOf(header)) : nullptr;
+    return toolbox::ItemsAs<Item>(section.items);
 }
 inline std::int32_t ItemCount(IniSectionRec const& section) {
-    toolbox::ListHeader* const header = toolbox::HeaderOf(section.items);
-    return header ? header->numItems : 0;
+    return toolbox::ItemCountOf(section.items);
 }
 inline IniSectionRec** SectionsOf(IniObjectRec const& ini) {
-    toolbox::ListHeader* const header = toolbox::HeaderOf(ini.sections);
-    return header ? reinterpret_cast<IniSectionRec**>(toolbox::ItemsOf(header)) : nullptr;
+    return toolbox::ItemsAs<IniSectionRec*>(ini.sections);
 }
 inline std::int32_t SectionCount(IniObjectRec const& ini) {
-    toolbox::ListHeader* const header = toolbox::HeaderOf(ini.sections);
-    return header ? header->numItems : 0;
+    return toolbox::ItemCountOf(ini.sections);
 }
 
 /// Byte order of NUL-terminated names, as unsigned bytes.

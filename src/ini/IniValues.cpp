@@ -310,17 +310,21 @@ namespace platform = tekit::platform;
                                [&](IniObjectRec& o, IniSectionRec& s) { return __VA_ARGS__; });    \
     }
 
-#define TEKIT_INI_GET(Name, OutType, ...)                                                          \
+#define TEKIT_INI_UNPAREN(...) __VA_ARGS__
+// A getter pair whose output parameters are `Params` (parenthesized) and present when `given`.
+#define TEKIT_INI_GETTER(Name, Params, given, ...)                                                 \
     extern "C" int TEKIT_STDCALL Name(IniHandle ini, char const* section, char const* tag,         \
-                                      OutType out) {                                               \
-        return BySectionName(ini, section, tag, out != nullptr,                                    \
+                                      TEKIT_INI_UNPAREN Params) {                                  \
+        return BySectionName(ini, section, tag, given,                                             \
                              [&](IniObjectRec& o, IniSectionRec& s) { return __VA_ARGS__; });      \
     }                                                                                              \
     extern "C" int TEKIT_STDCALL Name##SP(IniHandle ini, IniSection section, char const* tag,      \
-                                          OutType out) {                                           \
-        return BySectionPtr(ini, section, tag, out != nullptr,                                     \
+                                          TEKIT_INI_UNPAREN Params) {                              \
+        return BySectionPtr(ini, section, tag, given,                                              \
                             [&](IniObjectRec& o, IniSectionRec& s) { return __VA_ARGS__; });       \
     }
+#define TEKIT_INI_GET(Name, OutType, ...)                                                          \
+    TEKIT_INI_GETTER(Name, (OutType out), out != nullptr, __VA_ARGS__)
 
 // ---- Setters --------------------------------------------------------------------------------
 
@@ -345,6 +349,8 @@ extern "C" int TEKIT_STDCALL Ini_PutData(IniHandle ini, char const* section, cha
 }
 extern "C" int TEKIT_STDCALL Ini_PutDataSP(IniHandle ini, IniSection section, char const* tag,
                                            void const* data, int size) {
+    if (size < 0 || (!data && size > 0))
+        return INI_ERR_INVALID_ARGUMENT;
     return PutBySectionPtr(ini, section, tag, [&](IniObjectRec& o, IniSectionRec& s) {
         return PutDataValue(o, s, tag, data, size);
     });
@@ -408,38 +414,10 @@ TEKIT_INI_GET(Ini_GetPointerToRawString, char const**, WithValue(o, s, tag, [&](
               }))
 TEKIT_INI_GET(Ini_GetRawStringCopy, char**, StringCopy(o, s, tag, out, true))
 
-extern "C" int TEKIT_STDCALL Ini_GetStringIntoBuffer(IniHandle ini, char const* section,
-                                                     char const* tag, char* buffer,
-                                                     int bufferSize) {
-    return BySectionName(ini, section, tag, buffer != nullptr,
-                         [&](IniObjectRec& o, IniSectionRec& s) {
-                             return StringIntoBuffer(o, s, tag, buffer, bufferSize, false);
-                         });
-}
-extern "C" int TEKIT_STDCALL Ini_GetStringIntoBufferSP(IniHandle ini, IniSection section,
-                                                       char const* tag, char* buffer,
-                                                       int bufferSize) {
-    return BySectionPtr(ini, section, tag, buffer != nullptr,
-                        [&](IniObjectRec& o, IniSectionRec& s) {
-                            return StringIntoBuffer(o, s, tag, buffer, bufferSize, false);
-                        });
-}
-extern "C" int TEKIT_STDCALL Ini_GetRawStringIntoBuffer(IniHandle ini, char const* section,
-                                                        char const* tag, char* buffer,
-                                                        int bufferSize) {
-    return BySectionName(ini, section, tag, buffer != nullptr,
-                         [&](IniObjectRec& o, IniSectionRec& s) {
-                             return StringIntoBuffer(o, s, tag, buffer, bufferSize, true);
-                         });
-}
-extern "C" int TEKIT_STDCALL Ini_GetRawStringIntoBufferSP(IniHandle ini, IniSection section,
-                                                          char const* tag, char* buffer,
-                                                          int bufferSize) {
-    return BySectionPtr(ini, section, tag, buffer != nullptr,
-                        [&](IniObjectRec& o, IniSectionRec& s) {
-                            return StringIntoBuffer(o, s, tag, buffer, bufferSize, true);
-                        });
-}
+TEKIT_INI_GETTER(Ini_GetStringIntoBuffer, (char* buffer, int bufferSize), buffer != nullptr,
+                 StringIntoBuffer(o, s, tag, buffer, bufferSize, false))
+TEKIT_INI_GETTER(Ini_GetRawStringIntoBuffer, (char* buffer, int bufferSize), buffer != nullptr,
+                 StringIntoBuffer(o, s, tag, buffer, bufferSize, true))
 
 // ---- Typed getters --------------------------------------------------------------------------
 
@@ -466,17 +444,6 @@ TEKIT_INI_GET(Ini_GetBoolean, int*, WithValue(o, s, tag, [&](char const* value) 
                   return GetBooleanValue(o, value, *out);
               }))
 
-extern "C" int TEKIT_STDCALL Ini_GetData(IniHandle ini, char const* section, char const* tag,
-                                         void** data, int* size) {
-    return BySectionName(ini, section, tag, data && size, [&](IniObjectRec& o, IniSectionRec& s) {
-        return WithValue(o, s, tag,
-                         [&](char const* value) { return GetDataValue(value, *data, *size); });
-    });
-}
-extern "C" int TEKIT_STDCALL Ini_GetDataSP(IniHandle ini, IniSection section, char const* tag,
-                                           void** data, int* size) {
-    return BySectionPtr(ini, section, tag, data && size, [&](IniObjectRec& o, IniSectionRec& s) {
-        return WithValue(o, s, tag,
-                         [&](char const* value) { return GetDataValue(value, *data, *size); });
-    });
-}
+TEKIT_INI_GETTER(Ini_GetData, (void** data, int* size), data != nullptr && size != nullptr,
+                 WithValue(o, s, tag,
+                           [&](char const* value) { return GetDataValue(value, *data, *size); }))

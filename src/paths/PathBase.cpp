@@ -30,6 +30,18 @@ char const* SkipDot(char const* name) {
     return name && *name == '.' ? name + 1 : name;
 }
 
+/// Assigns to `out` the part of `path` that `find` locates, less its first `skip` characters;
+/// clears `out` when there is no such part.
+void AssignPart(String const& path, bool (*find)(PathChars const&, int&, int&), int skip,
+                String& out) {
+    PathChars const chars = ToChars(path);
+    int start = 0, length = 0;
+    if (find(chars, start, length))
+        AssignChars(out, chars, start + skip, start + length);
+    else
+        out.Clear();
+}
+
 } // namespace
 
 PathBase::~PathBase() = default;
@@ -114,30 +126,15 @@ void PathBase::GetDirectoryPathName(String& out) const {
 }
 
 void PathBase::GetFileName(String& out) const {
-    PathChars const chars = ToChars(GetPathString());
-    int start = 0, length = 0;
-    if (detail::FindFileName(chars, start, length))
-        AssignChars(out, chars, start, start + length);
-    else
-        out.Clear();
+    AssignPart(GetPathString(), detail::FindFileName, 0, out);
 }
 
 void PathBase::GetBaseName(String& out) const {
-    PathChars const chars = ToChars(GetPathString());
-    int start = 0, length = 0;
-    if (detail::FindBaseName(chars, start, length))
-        AssignChars(out, chars, start, start + length);
-    else
-        out.Clear();
+    AssignPart(GetPathString(), detail::FindBaseName, 0, out);
 }
 
 void PathBase::GetExtension(String& out) const {
-    PathChars const chars = ToChars(GetPathString());
-    int dot = 0, length = 0;
-    if (detail::FindExtension(chars, dot, length))
-        AssignChars(out, chars, dot + 1, dot + length);
-    else
-        out.Clear();
+    AssignPart(GetPathString(), detail::FindExtension, 1, out); // without the dot
 }
 
 void PathBase::SetDirectoryPathName(char const* directory) {

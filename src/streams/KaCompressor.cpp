@@ -4,6 +4,7 @@
 #include "platform/File.h"
 #include "platform/Module.h"
 #include "streams/LittleEndian.h"
+#include "sync/ExclusiveHold.h"
 #include "tekit/environment/KnownDirectories.h"
 #include "tekit/errors/RString.h"
 #include "tekit/errors/Raise.h"
@@ -29,14 +30,6 @@ GlobalOSCriticalSection& LoadLock() {
     static GlobalOSCriticalSection lock;
     return lock;
 }
-
-class LoadHold {
-public:
-    LoadHold() { LoadLock().Lock(kExclusiveAccess, 0); }
-    ~LoadHold() { LoadLock().Unlock(kExclusiveAccess); }
-    LoadHold(LoadHold const&) = delete;
-    LoadHold& operator=(LoadHold const&) = delete;
-};
 
 /// The "ERR_DESCR" message `key` with its placeholders filled from the last back, so a '%'
 /// in a path is never taken for a placeholder.
@@ -89,7 +82,7 @@ KaCompressor::~KaCompressor() {
 void KaCompressor::Load() {
     if (m_loaded.load(std::memory_order_acquire))
         return;
-    LoadHold const hold;
+    detail::ExclusiveHold const hold(LoadLock());
     if (m_loaded.load(std::memory_order_relaxed))
         return;
     DynamicString const file = FindModule();

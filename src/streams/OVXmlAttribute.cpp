@@ -13,6 +13,15 @@ std::string_view ViewOf(String const& text) {
     return std::string_view(text.GetBufferReadPtr(), static_cast<std::size_t>(text.GetNumBytes()));
 }
 
+/// What `parse` reads from `text`; `fail` raises when it reads nothing valid.
+template <class T, class Fail>
+T ParsedValue(std::string_view text, bool (*parse)(std::string_view, T&), Fail&& fail) {
+    T value{};
+    if (!parse(text, value))
+        fail();
+    return value;
+}
+
 } // namespace
 
 OVXmlAttribute::OVXmlAttribute(String const& tagName, String const& value, unsigned int line,
@@ -41,45 +50,33 @@ void OVXmlAttribute::ThrowBadValue(char const* key) const {
 }
 
 bool OVXmlAttribute::GetAsBool() const {
-    bool value = false;
-    if (!streams::ParseXmlBool(ViewOf(m_value), value))
-        ThrowBadValue(streams::kNotBool);
-    return value;
+    return ParsedValue(ViewOf(m_value), streams::ParseXmlBool,
+                       [this] { ThrowBadValue(streams::kNotBool); });
 }
 
 int OVXmlAttribute::GetAsInt() const {
-    int value = 0;
-    if (!streams::ParseXmlInt(ViewOf(m_value), value))
-        ThrowBadValue(streams::kNotInteger);
-    return value;
+    return ParsedValue(ViewOf(m_value), streams::ParseXmlInt,
+                       [this] { ThrowBadValue(streams::kNotInteger); });
 }
 
 unsigned int OVXmlAttribute::GetAsUInt() const {
-    unsigned int value = 0;
-    if (!streams::ParseXmlUInt(ViewOf(m_value), value))
-        ThrowBadValue(streams::kNotInteger);
-    return value;
+    return ParsedValue(ViewOf(m_value), streams::ParseXmlUInt,
+                       [this] { ThrowBadValue(streams::kNotInteger); });
 }
 
 std::int64_t OVXmlAttribute::GetAsInt64() const {
-    std::int64_t value = 0;
-    if (!streams::ParseXmlInt64(ViewOf(m_value), value))
-        ThrowBadValue(streams::kNotInteger);
-    return value;
+    return ParsedValue(ViewOf(m_value), streams::ParseXmlInt64,
+                       [this] { ThrowBadValue(streams::kNotInteger); });
 }
 
 std::uint64_t OVXmlAttribute::GetAsUInt64() const {
-    std::uint64_t value = 0;
-    if (!streams::ParseXmlUInt64(ViewOf(m_value), value))
-        ThrowBadValue(streams::kNotInteger);
-    return value;
+    return ParsedValue(ViewOf(m_value), streams::ParseXmlUInt64,
+                       [this] { ThrowBadValue(streams::kNotInteger); });
 }
 
 double OVXmlAttribute::GetAsDouble() const {
-    double value = 0;
-    if (!streams::ParseXmlDouble(ViewOf(m_value), value))
-        ThrowBadValue(streams::kNotNumber);
-    return value;
+    return ParsedValue(ViewOf(m_value), streams::ParseXmlDouble,
+                       [this] { ThrowBadValue(streams::kNotNumber); });
 }
 
 void OVXmlAttribute::GetAsString(DynamicString& value) const {

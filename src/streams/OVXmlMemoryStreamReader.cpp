@@ -471,6 +471,19 @@ public:
         }
     }
 
+    /// The name of the start tag that comes next, markup skipped, into `name`; false inside
+    /// a self-closing element or when something else comes next. Nothing is committed.
+    bool PeekStartTagName(std::string_view& name) {
+        if (m_stream.m_pendingEmpty)
+            return false;
+        SkipMisc(true);
+        if (Peek() != kStartTag)
+            return false;
+        Skip(1);
+        name = ReadName();
+        return true;
+    }
+
     /// Inside an element read as self-closing nothing but its end may be read.
     void CheckNotInsideEmpty(std::string_view name) const {
         if (m_stream.m_pendingEmpty)
@@ -700,25 +713,14 @@ void OVXmlMemoryStream::ReadElementEnd(char const* name, bool nameIsUtf8) {
 
 bool OVXmlMemoryStream::IsNextElement(char const* name) {
     streams::Utf8Name const utf8(name, false);
-    if (m_pendingEmpty)
-        return false;
-    Reader reader(*this);
-    reader.SkipMisc(true);
-    if (reader.Peek() != Reader::kStartTag)
-        return false;
-    reader.Skip(1);
-    return reader.ReadName() == utf8.view;
+    std::string_view found;
+    return Reader(*this).PeekStartTagName(found) && found == utf8.view;
 }
 
 bool OVXmlMemoryStream::GetNextElementName(DynamicString& name, bool nameAsUtf8) {
-    if (m_pendingEmpty)
+    std::string_view found;
+    if (!Reader(*this).PeekStartTagName(found))
         return false;
-    Reader reader(*this);
-    reader.SkipMisc(true);
-    if (reader.Peek() != Reader::kStartTag)
-        return false;
-    reader.Skip(1);
-    std::string_view const found = reader.ReadName();
     if (nameAsUtf8)
         streams::AssignExact(name, found);
     else

@@ -169,19 +169,9 @@ int CopyOnWriteMemory::ResizeBuffer(CopyOnWriteMemory** holder, int size, bool k
 unsigned char* CopyOnWriteMemory::GetWritePtr(CopyOnWriteMemory** holder) {
     if (IsExclusive())
         return m_data;
-    CopyOnWriteMemory* fresh = NewHeapBlock();
-    try {
-        fresh->PrivateResize(m_bufferSize, false, true);
-    } catch (...) {
-        fresh->Release();
-        throw;
-    }
-    if (m_data && m_bufferSize > 0)
-        std::memcpy(fresh->m_data, m_data, size_t(std::min(m_bufferSize, fresh->m_bufferSize)));
-    CopyOnWriteMemory const* old = *holder;
-    *holder = fresh;
-    old->Drop();
-    return fresh->m_data;
+    // A shared block is copied whole into a block of this one's own; this one may go.
+    ResizeBuffer(holder, m_bufferSize, true, true);
+    return (*holder)->m_data;
 }
 
 void CopyOnWriteMemory::SetContents(CopyOnWriteMemory** holder, unsigned char const* bytes,

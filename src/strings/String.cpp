@@ -219,26 +219,28 @@ int ScrambleKey(int i) {
     return static_cast<int>((31LL * i + 7) % 255);
 }
 
+/// Rotates each byte of `s` (1-255) by `sign` times its key within 1-255; returns the text's
+/// byte count, which stays, or 0 for an empty text (left alone).
+int RotateBytes(String& s, int sign) {
+    int const numBytes = s.GetNumBytes();
+    if (numBytes == 0)
+        return 0;
+    auto* p = reinterpret_cast<unsigned char*>(s.GetBufferWritePtr());
+    for (int i = 0; i < numBytes; ++i)
+        p[i] = static_cast<unsigned char>((p[i] - 1 + sign * ScrambleKey(i) + 255) % 255 + 1);
+    return numBytes;
+}
+
 } // namespace
 
 void String::Scramble() {
-    int const numBytes = GetNumBytes();
-    if (numBytes == 0)
-        return;
-    auto* p = reinterpret_cast<unsigned char*>(GetBufferWritePtr());
-    for (int i = 0; i < numBytes; ++i)
-        p[i] = static_cast<unsigned char>((p[i] - 1 + ScrambleKey(i)) % 255 + 1);
-    SetCachedSize(numBytes + 1);
+    if (int const numBytes = RotateBytes(*this, 1))
+        SetCachedSize(numBytes + 1);
 }
 
 void String::Unscramble() {
-    int const numBytes = GetNumBytes();
-    if (numBytes == 0)
-        return;
-    auto* p = reinterpret_cast<unsigned char*>(GetBufferWritePtr());
-    for (int i = 0; i < numBytes; ++i)
-        p[i] = static_cast<unsigned char>((p[i] - 1 - ScrambleKey(i) + 255) % 255 + 1);
-    SetCachedSize(numBytes + 1);
+    if (int const numBytes = RotateBytes(*this, -1))
+        SetCachedSize(numBytes + 1);
 }
 
 // ---- Assertions and orderings ---------------------------------------------------------

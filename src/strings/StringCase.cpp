@@ -53,6 +53,24 @@ void FoldBytes(char* p, CaseRange const& range, bool upper) {
     }
 }
 
+/// Folds `numChars` characters from character `start` of `s` to upper or lower case; returns
+/// the text's byte count, which folding keeps, or -1 when no character changes (the text is
+/// then left alone).
+int FoldCase(String& s, int start, int numChars, bool upper, bool mb) {
+    CaseRange const range = FindCaseRange(s, start, numChars, upper, mb);
+    if (range.first >= range.end)
+        return -1;
+    int const numBytes = s.GetNumBytes();
+    char* p = s.GetBufferWritePtr();
+    if (!mb)
+        FoldBytes(p, range, upper);
+    else if (upper)
+        String::MBCSUpperN(p + range.first, range.numChars);
+    else
+        String::MBCSLowerN(p + range.first, range.numChars);
+    return numBytes;
+}
+
 } // namespace
 
 void String::SetUppercase() {
@@ -64,31 +82,15 @@ void String::SetLowercase() {
 }
 
 void String::SetUppercase(int start, int numChars) {
-    bool const mb = m_isMultiByteSupportEnabled;
-    CaseRange const range = FindCaseRange(*this, start, numChars, true, mb);
-    if (range.first >= range.end)
-        return;
-    int const numBytes = GetNumBytes();
-    char* p = GetBufferWritePtr();
-    if (mb)
-        MBCSUpperN(p + range.first, range.numChars);
-    else
-        FoldBytes(p, range, true);
-    SetCachedSize(numBytes + 1);
+    int const numBytes = FoldCase(*this, start, numChars, true, m_isMultiByteSupportEnabled);
+    if (numBytes >= 0)
+        SetCachedSize(numBytes + 1);
 }
 
 void String::SetLowercase(int start, int numChars) {
-    bool const mb = m_isMultiByteSupportEnabled;
-    CaseRange const range = FindCaseRange(*this, start, numChars, false, mb);
-    if (range.first >= range.end)
-        return;
-    int const numBytes = GetNumBytes();
-    char* p = GetBufferWritePtr();
-    if (mb)
-        MBCSLowerN(p + range.first, range.numChars);
-    else
-        FoldBytes(p, range, false);
-    SetCachedSize(numBytes + 1);
+    int const numBytes = FoldCase(*this, start, numChars, false, m_isMultiByteSupportEnabled);
+    if (numBytes >= 0)
+        SetCachedSize(numBytes + 1);
 }
 
 // In place: each double-byte character is first stored trail byte first, so reversing all

@@ -140,25 +140,31 @@ struct AttributeTable {
     }
 };
 
-} // namespace
-
-void String::EscapeSpecialChars(bool keepLayoutChars) {
-    bool const mb = IsMultiByteSupportEnabled();
-    char const* text = GetBufferReadPtr();
+/// Replaces each single-byte character of `s` for which `replacementOf(c)` gives a text (not
+/// null) by that text; returns whether anything changed.
+template <class ReplacementOf>
+bool ReplaceSingleByteChars(String& s, bool mb, ReplacementOf&& replacementOf) {
+    char const* text = s.GetBufferReadPtr();
     detail::Rewriter out(text);
-    char hex[8];
     for (char const* p = text; *p;) {
         int const n = detail::CharBytes(p, mb);
-        char const* escape =
-            n == 1 ? SpecialCharEscape(static_cast<unsigned char>(*p), keepLayoutChars, hex)
-                   : nullptr;
-        if (escape)
-            out.Replace(p, escape);
+        char const* replacement = n == 1 ? replacementOf(static_cast<unsigned char>(*p)) : nullptr;
+        if (replacement)
+            out.Replace(p, replacement);
         else
             out.Keep(p, n);
         p += n;
     }
-    out.StoreInto(*this);
+    return out.StoreInto(s);
+}
+
+} // namespace
+
+void String::EscapeSpecialChars(bool keepLayoutChars) {
+    char hex[8];
+    ReplaceSingleByteChars(*this, IsMultiByteSupportEnabled(), [&](unsigned char c) {
+        return SpecialCharEscape(c, keepLayoutChars, hex);
+    });
 }
 
 void String::UnescapeSpecialChars(bool keepLayoutChars) {
@@ -217,21 +223,9 @@ bool String::FindNextUnescapedQuoteChar(char const* text, int* index, bool* pass
 bool String::EscapeCharsHelper(String& text, char const* characters, char const** replacements) {
     if (!characters || !replacements || !*characters)
         return false;
-    bool const mb = IsMultiByteSupportEnabled();
-    char const* p = text.GetBufferReadPtr();
-    detail::Rewriter out(p);
-    while (*p) {
-        int const n = detail::CharBytes(p, mb);
-        char const* replacement =
-            n == 1 ? FindReplacement(static_cast<unsigned char>(*p), characters, replacements)
-                   : nullptr;
-        if (replacement)
-            out.Replace(p, replacement);
-        else
-            out.Keep(p, n);
-        p += n;
-    }
-    return out.StoreInto(text);
+    return ReplaceSingleByteChars(text, IsMultiByteSupportEnabled(), [&](unsigned char c) {
+        return FindReplacement(c, characters, replacements);
+    });
 }
 
 bool String::EscapeXmlChars(String& text, bool escapeApostrophe) {

@@ -7,6 +7,7 @@
 
 #include "platform/Clock.h"
 #include "platform/MessageLoop.h"
+#include "sync/ExclusiveHold.h"
 
 #include <atomic>
 
@@ -25,14 +26,6 @@ GlobalOSCriticalSection& DetectionLock() {
     static auto* const lock = new GlobalOSCriticalSection;
     return *lock;
 }
-
-class DetectionHold {
-public:
-    DetectionHold() { DetectionLock().Lock(kExclusiveAccess, 0); }
-    ~DetectionHold() { DetectionLock().Unlock(kExclusiveAccess); }
-    DetectionHold(DetectionHold const&) = delete;
-    DetectionHold& operator=(DetectionHold const&) = delete;
-};
 
 /// The "C" locale's case folding, which touches only A to Z: the same answer under any
 /// locale the host process sets, with no locale object to create.
@@ -107,7 +100,7 @@ bool TimeoutElapsed(double startSeconds, unsigned long timeoutMs) {
 } // namespace detail
 
 void LWAwareCriticalSectionImplementation::InitializeLWUIThreadDetectionHooks() {
-    DetectionHold hold;
+    detail::ExclusiveHold const hold(DetectionLock());
     if (gSlot.load(std::memory_order_relaxed) == platform::kNoThreadSlot) {
         std::uint32_t slot = platform::kNoThreadSlot;
         if (platform::SystemError const error = platform::AllocateThreadSlot(slot))
@@ -128,7 +121,7 @@ void LWAwareCriticalSectionImplementation::InitializeLWUIThreadDetectionHooks() 
 }
 
 void LWAwareCriticalSectionImplementation::CleanupLWUIThreadDetectionHooks() {
-    DetectionHold hold;
+    detail::ExclusiveHold const hold(DetectionLock());
     platform::RemoveWindowEventHook(gHook);
     gHook = nullptr;
     std::uint32_t const slot = gSlot.exchange(platform::kNoThreadSlot, std::memory_order_acq_rel);

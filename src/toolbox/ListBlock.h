@@ -38,6 +38,19 @@ inline char* ItemsOf(ListHeader* header) {
     return reinterpret_cast<char*>(header + 1);
 }
 
+/// The items of `list` as an array of `T`, reached without a call; null when `list` is no
+/// list block.
+template <class T> T* ItemsAs(ListType list) {
+    ListHeader* const header = HeaderOf(list);
+    return header ? reinterpret_cast<T*>(ItemsOf(header)) : nullptr;
+}
+
+/// How many items `list` holds; 0 when it is no list block.
+inline std::int32_t ItemCountOf(ListType list) {
+    ListHeader* const header = HeaderOf(list);
+    return header ? header->numItems : 0;
+}
+
 /// The 0-based index of an existing item at `position` (LIST_POS_FRONT, LIST_POS_END or 1 to
 /// numItems); -1 when there is no such item.
 inline std::int32_t ItemIndex(ListHeader const& header, std::int32_t position) {

@@ -14,8 +14,6 @@
 #include <gtest/gtest.h>
 
 #include <filesystem>
-#include <fstream>
-#include <iterator>
 #include <string>
 
 namespace tekit {
@@ -25,7 +23,7 @@ class FileTypeDetection : public ::testing::Test {
 protected:
     std::string File(char const* name) const { return (m_scratch.Root() / name).string(); }
     std::string Write(char const* name, std::string const& bytes) const {
-        std::ofstream(File(name), std::ios::binary) << bytes;
+        testing::WriteFileBytes(File(name), bytes);
         return File(name);
     }
     std::string WriteHeaderFile(char const* name, bool asXml) const {
@@ -43,10 +41,6 @@ protected:
         ini.Set("Limits", "High", 9L);
         ini.WriteFile(Path(File(name).c_str()), binary, asText);
         return File(name);
-    }
-    static std::string Contents(std::string const& file) {
-        std::ifstream in(file, std::ios::binary);
-        return std::string(std::istreambuf_iterator<char>(in), {});
     }
 
     testing::ScratchDirectory m_scratch{"formats"};
@@ -66,7 +60,7 @@ TEST_F(FileTypeDetection, TellsEveryFormReadsItsHeaderAndChangesNothing) {
         {WriteIniFile("c.ini", true, true), kTextFileFormat, "LimitsFile", 3},
     };
     for (Case const& c : cases) {
-        std::string const before = Contents(c.file);
+        std::string const before = testing::ReadFileBytes(c.file);
         Path const path(c.file.c_str());
         FileWritingFormats format = FileWritingFormats(0);
         OVFileHeader header;
@@ -83,7 +77,7 @@ TEST_F(FileTypeDetection, TellsEveryFormReadsItsHeaderAndChangesNothing) {
         EXPECT_TRUE(OVGetHeaderInformation(path, format, header, kHeaderInfoDetectFormatOnly));
         EXPECT_EQ(format, c.format);
         EXPECT_EQ(header.ValidHeader(), c.format != kTextFileFormat) << c.file;
-        EXPECT_EQ(Contents(c.file), before);
+        EXPECT_EQ(testing::ReadFileBytes(c.file), before);
     }
 }
 

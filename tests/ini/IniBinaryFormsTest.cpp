@@ -12,8 +12,6 @@
 #include <gtest/gtest.h>
 
 #include <cstdint>
-#include <fstream>
-#include <iterator>
 #include <string>
 
 namespace tekit::testing {
@@ -63,12 +61,9 @@ std::string Encoded(std::string const& bytes) {
 class IniBinaryForms : public ::testing::Test {
 protected:
     Path At(char const* name) const { return Path((m_scratch.Root() / name).string().c_str()); }
-    static std::string Bytes(Path const& path) {
-        std::ifstream in(path.CStr(), std::ios::binary);
-        return {std::istreambuf_iterator<char>(in), {}};
-    }
+    static std::string Bytes(Path const& path) { return ReadFileBytes(path.CStr()); }
     static void Put(Path const& path, std::string const& bytes) {
-        std::ofstream(path.CStr(), std::ios::binary) << bytes;
+        WriteFileBytes(path.CStr(), bytes);
     }
 
     ScratchDirectory m_scratch{"inibinary"};

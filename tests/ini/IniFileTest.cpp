@@ -12,7 +12,6 @@
 #include <cstdlib>
 #include <filesystem>
 #include <fstream>
-#include <iterator>
 #include <random>
 #include <thread>
 
@@ -32,13 +31,6 @@ class IniFile : public ::testing::Test {
 protected:
     std::string At(char const* name) const { return (m_root / name).string(); }
 
-    static void WriteBytes(std::string const& path, std::string const& bytes) {
-        std::ofstream(path, std::ios::binary) << bytes;
-    }
-    static std::string ReadBytes(std::string const& path) {
-        std::ifstream in(path, std::ios::binary);
-        return {std::istreambuf_iterator<char>(in), {}};
-    }
     /// Names in the test directory that a save left behind.
     std::vector<std::string> Temporaries() const {
         std::vector<std::string> names;
@@ -70,7 +62,7 @@ TEST_F(IniFile, BadBytesReadAsDocumented) {
     };
     for (auto const& c : cases) {
         SCOPED_TRACE(c.name);
-        WriteBytes(At("in.ini"), c.bytes);
+        WriteFileBytes(At("in.ini"), c.bytes);
         IniObject ini;
         ASSERT_EQ(Ini_ReadFromFile(ini, At("in.ini").c_str()), 0);
         if (c.dump)
@@ -86,7 +78,7 @@ TEST_F(IniFile, LargeObjectsReadAndWriteWhole) {
     std::string text;
     for (int i = 0; i < 100000; ++i)
         text += "[S" + std::to_string(i) + "]\nK=" + std::to_string(i) + "\n";
-    WriteBytes(At("many.ini"), text);
+    WriteFileBytes(At("many.ini"), text);
     IniObject ini;
     ASSERT_EQ(Ini_ReadFromFile(ini, At("many.ini").c_str()), 0);
     EXPECT_EQ(Ini_NumberOfSections(ini), 100000);
@@ -96,7 +88,7 @@ TEST_F(IniFile, LargeObjectsReadAndWriteWhole) {
         c = static_cast<char>('!' + random() % 90);
     ASSERT_EQ(Ini_PutRawString(ini, "S5", "Big", value.c_str()), 0);
     ASSERT_EQ(Ini_WriteToFile(ini, At("copy.ini").c_str()), 0);
-    text = ReadBytes(At("copy.ini"));
+    text = ReadFileBytes(At("copy.ini"));
     EXPECT_NE(text.find("\nBig Line9999 = "), std::string::npos);
     EXPECT_NE(text.find("\nBig Line10000 = "), std::string::npos);
     IniObject back;
@@ -111,7 +103,7 @@ TEST_F(IniFile, LargeObjectsReadAndWriteWhole) {
 TEST_F(IniFile, OpenAndReadFailuresHaveTheirStatus) {
     IniObject ini;
     EXPECT_EQ(Ini_ReadFromFile(ini, At("missing.ini").c_str()), INI_ERR_CANT_OPEN_FILE);
-    WriteBytes(At("in.ini"), "[s]\nK=1");
+    WriteFileBytes(At("in.ini"), "[s]\nK=1");
     {
         ScopedFault const fault(FaultKind::Open, 1, native::kAccessDenied);
         EXPECT_EQ(Ini_ReadFromFile(ini, At("in.ini").c_str()), INI_ERR_CANT_OPEN_FILE);
@@ -131,7 +123,7 @@ TEST_F(IniFile, ExhaustedMemoryDuringAReadLeavesAUsableObject) {
     for (int i = 0; i < 300; ++i)
         text += "[S" + std::to_string(i % 7) + "]\nT Line1=" + std::string(i, 'x') +
                 "\nT Line2=y\nK=" + std::to_string(i) + "\n";
-    WriteBytes(At("in.ini"), text);
+    WriteFileBytes(At("in.ini"), text);
     for (std::uint32_t nth = 1;; ++nth) {
         IniObject ini;
         int status = 0;
@@ -178,13 +170,13 @@ TEST_F(IniFile, FailedSaveLeavesTargetAndNoTemporaryFile) {
                   0);
     for (auto const& f : faults) {
         SCOPED_TRACE(f.name);
-        WriteBytes(At("target.ini"), old);
+        WriteFileBytes(At("target.ini"), old);
         {
             ScopedFault const fault(f.kind, f.nth, f.error);
             EXPECT_EQ(Ini_WriteToFile(ini, At("target.ini").c_str()), f.status);
             EXPECT_TRUE(fault.Fired());
         }
-        EXPECT_EQ(ReadBytes(At("target.ini")), old);
+        EXPECT_EQ(ReadFileBytes(At("target.ini")), old);
         EXPECT_TRUE(Temporaries().empty());
     }
 }
@@ -192,12 +184,12 @@ TEST_F(IniFile, FailedSaveLeavesTargetAndNoTemporaryFile) {
 TEST_F(IniFile, ReadOnlyOrDirectoryTargetIsNotWritable) {
     IniObject ini;
     ASSERT_EQ(Ini_PutInt(ini, "s", "K", 1), 0);
-    WriteBytes(At("locked.ini"), "[old]\n");
+    WriteFileBytes(At("locked.ini"), "[old]\n");
     fs::permissions(At("locked.ini"),
                     fs::perms::owner_write | fs::perms::group_write | fs::perms::others_write,
                     fs::perm_options::remove);
     EXPECT_EQ(Ini_WriteToFile(ini, At("locked.ini").c_str()), INI_ERR_CANT_WRITE_FILE);
-    EXPECT_EQ(ReadBytes(At("locked.ini")), "[old]\n");
+    EXPECT_EQ(ReadFileBytes(At("locked.ini")), "[old]\n");
     fs::create_directory(At("folder.ini"));
     EXPECT_EQ(Ini_WriteToFile(ini, At("folder.ini").c_str()), INI_ERR_CANT_WRITE_FILE);
     EXPECT_TRUE(fs::is_directory(At("folder.ini")));
@@ -209,14 +201,14 @@ TEST_F(IniFile, ReadOnlyOrDirectoryTargetIsNotWritable) {
 #if !defined(_WIN32)
 TEST_F(IniFile, ReplacedFileKeepsItsPermissionsAndNewFileGetsTheUsualOnes) {
     auto const shared = fs::perms::owner_read | fs::perms::owner_write | fs::perms::group_read;
-    WriteBytes(At("shared.ini"), "[old]\n");
+    WriteFileBytes(At("shared.ini"), "[old]\n");
     fs::permissions(At("shared.ini"), shared);
     IniObject ini;
     ASSERT_EQ(Ini_PutInt(ini, "s", "K", 1), 0);
     ASSERT_EQ(Ini_WriteToFile(ini, At("shared.ini").c_str()), 0);
     EXPECT_EQ(fs::status(At("shared.ini")).permissions() & fs::perms::all, shared);
     ASSERT_EQ(Ini_WriteToFile(ini, At("new.ini").c_str()), 0);
-    WriteBytes(At("plain.ini"), "");
+    WriteFileBytes(At("plain.ini"), "");
     EXPECT_EQ(fs::status(At("new.ini")).permissions(), fs::status(At("plain.ini")).permissions());
     // Where permissions cannot be set, the save goes on and the file is its owner's only.
     ScopedFault const refused(FaultKind::Attributes, 1, native::kAccessDenied);
@@ -270,7 +262,7 @@ TEST(IniSaveChildProcess, StopsBeforeReplacing) {
 TEST_F(IniFile, KilledBetweenTemporaryWriteAndRenameLeavesTheOldTarget) {
     std::string const target = At("target.ini");
     std::string const old = VariantText(0);
-    WriteBytes(target, old);
+    WriteFileBytes(target, old);
     platform::ProcessHandle child = nullptr;
     ASSERT_FALSE(platform::StartProcess(platform::CurrentProgramPath().c_str(),
                                         {"--gtest_filter=IniSaveChildProcess.*"},
@@ -281,10 +273,10 @@ TEST_F(IniFile, KilledBetweenTemporaryWriteAndRenameLeavesTheOldTarget) {
     bool const stopped = fs::exists(target + ".ready");
     platform::CloseProcess(child); // kills it where it stands
     ASSERT_TRUE(stopped) << "the child never reached the rename";
-    EXPECT_EQ(ReadBytes(target), old);
+    EXPECT_EQ(ReadFileBytes(target), old);
     // The complete temporary file is what the dead process leaves.
     ASSERT_EQ(Temporaries().size(), 1u);
-    EXPECT_EQ(ReadBytes(Temporaries()[0]), VariantText(1));
+    EXPECT_EQ(ReadFileBytes(Temporaries()[0]), VariantText(1));
 }
 
 } // namespace

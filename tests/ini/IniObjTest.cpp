@@ -11,8 +11,6 @@
 #include <gtest/gtest.h>
 
 #include <filesystem>
-#include <fstream>
-#include <iterator>
 #include <memory>
 #include <string>
 
@@ -161,10 +159,7 @@ TEST(IniObj, CompareCopyAndOrder) {
 class IniObjFile : public ::testing::Test {
 protected:
     Path At(char const* name) const { return Path((m_scratch.Root() / name).string().c_str()); }
-    static std::string Bytes(Path const& path) {
-        std::ifstream in(path.CStr(), std::ios::binary);
-        return {std::istreambuf_iterator<char>(in), {}};
-    }
+    static std::string Bytes(Path const& path) { return ReadFileBytes(path.CStr()); }
     bool TemporaryLeft() const {
         for (auto const& entry : fs::directory_iterator(m_scratch.Root()))
             if (entry.path().filename().string().starts_with("ini$$"))
@@ -216,7 +211,7 @@ TEST_F(IniObjFile, FailedSavesInEveryFormLeaveTheTargetAndNoTemporaryFile) {
                        {true, true, "IniObj::WriteAsBinary"}};
     std::unique_ptr<IniObj> ini(Parsed("[S]\nx = 1\n"));
     Path const target = At("target.ini");
-    std::ofstream(target.CStr(), std::ios::binary) << "before";
+    WriteFileBytes(target.CStr(), "before");
     for (auto const& form : forms)
         for (auto const& f : faults) {
             SCOPED_TRACE(std::string(f.name) + (form.binary ? form.asText ? " text" : " bin" : ""));

@@ -8,16 +8,16 @@
 
 #include <cerrno>
 #include <filesystem>
-#include <fstream>
 #include <random>
-#include <sstream>
 #include <string>
 #include <tuple>
 
 using namespace tekit;
 using tekit::testing::FaultKind;
 using tekit::testing::Raised;
+using tekit::testing::ReadFileBytes;
 using tekit::testing::ScopedFault;
+using tekit::testing::WriteFileBytes;
 namespace native = tekit::platform::native;
 namespace fs = std::filesystem;
 
@@ -37,14 +37,9 @@ protected:
         return At(dir + kHostSeparator + name);
     }
     void Write(std::string const& name, std::string const& contents) const {
-        std::ofstream(At(name), std::ios::binary) << contents;
+        WriteFileBytes(At(name), contents);
     }
-    std::string Read(std::string const& name) const {
-        std::ifstream in(At(name), std::ios::binary);
-        std::ostringstream contents;
-        contents << in.rdbuf();
-        return contents.str();
-    }
+    std::string Read(std::string const& name) const { return ReadFileBytes(At(name)); }
     bool Has(std::string const& name) const { return fs::exists(At(name)); }
     /// The library's path of `name`, and its quoted form in messages.
     DynamicPath P(std::string const& name) const { return DynamicPath(At(name).c_str()); }

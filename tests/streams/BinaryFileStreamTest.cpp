@@ -14,10 +14,8 @@
 #include <gtest/gtest.h>
 
 #include <filesystem>
-#include <fstream>
 #include <functional>
 #include <memory>
-#include <sstream>
 #include <string>
 #include <thread>
 
@@ -27,17 +25,6 @@ using namespace tekit;
 using namespace tekit::testing;
 using namespace std::string_literals;
 namespace fs = std::filesystem;
-
-std::string Contents(std::string const& path) {
-    std::ifstream in(path, std::ios::binary);
-    std::ostringstream text;
-    text << in.rdbuf();
-    return text.str();
-}
-
-void Put(std::string const& path, std::string const& bytes) {
-    std::ofstream(path, std::ios::binary) << bytes;
-}
 
 std::string ReadAll(OVBinaryFileStream& s) {
     std::string bytes(static_cast<std::size_t>(s.GetLargeSize()), '\0');
@@ -67,7 +54,7 @@ TEST_F(BinaryFileStream, OpensEachTypeAsTheTableSays) {
     };
     for (Case const& c : cases) {
         SCOPED_TRACE(c.type);
-        Put(file, "abcdef");
+        WriteFileBytes(file, "abcdef");
         {
             OVBinaryFileStream s(file.c_str(), c.type);
             EXPECT_EQ(s.GetLargeSize(), c.sizeAtOpen);
@@ -82,7 +69,7 @@ TEST_F(BinaryFileStream, OpensEachTypeAsTheTableSays) {
                 EXPECT_RAISES(s.ReadBytes(&byte, 1, TE_NO_ERROR), TE_ACCESS_DENIED);
             }
         }
-        EXPECT_EQ(Contents(file), c.afterWritingXY.empty() ? "abcdef" : c.afterWritingXY);
+        EXPECT_EQ(ReadFileBytes(file), c.afterWritingXY.empty() ? "abcdef" : c.afterWritingXY);
     }
 }
 
@@ -101,7 +88,7 @@ TEST_F(BinaryFileStream, ReopensAsANewTypeAndKeepsThePathWithoutAFile) {
     EXPECT_RAISES(s.Flush(), TE_IO_ERROR);
     s.Move(DynamicString("elsewhere.bin")); // only the path changes
     EXPECT_EQ(s.GetFilePath(), "elsewhere.bin");
-    EXPECT_EQ(Contents(file), "saved"s + '\0');
+    EXPECT_EQ(ReadFileBytes(file), "saved"s + '\0');
 }
 
 TEST_F(BinaryFileStream, RefusesBadTypesAndReportsOpenFailuresWithThePath) {
@@ -119,7 +106,7 @@ TEST_F(BinaryFileStream, RefusesBadTypesAndReportsOpenFailuresWithThePath) {
     // Writing types make the missing directories of an absolute path.
     std::string const deep = (scratch.Root() / "a" / "b" / "new.bin").string();
     OVBinaryFileStream(deep.c_str(), kOVFileStreamCreateForWrite).WriteBytes("z", 1);
-    EXPECT_EQ(Contents(deep), "z");
+    EXPECT_EQ(ReadFileBytes(deep), "z");
 }
 
 TEST_F(BinaryFileStream, EncodesAsTheMemoryStreamAndReadsBackAcrossTheBuffer) {
@@ -151,7 +138,7 @@ TEST_F(BinaryFileStream, EncodesAsTheMemoryStreamAndReadsBackAcrossTheBuffer) {
         ASSERT_EQ(s.ReadInt(""), i);
     EXPECT_RAISES(s.ReadBool(""), TE_BAD_FILE_FORMAT);
     s.SetStreamType(kOVFileStreamNoFile); // others may read it now (Windows)
-    EXPECT_TRUE(Contents(file) == Bytes(memory));
+    EXPECT_TRUE(ReadFileBytes(file) == Bytes(memory));
 }
 
 TEST_F(BinaryFileStream, KeepsReadsWritesAndSizesCoherentWithTheBuffer) {
@@ -176,7 +163,7 @@ TEST_F(BinaryFileStream, KeepsReadsWritesAndSizesCoherentWithTheBuffer) {
     char bytes[8] = {};
     EXPECT_EQ(s.ReadBytes(bytes, 8, TE_NO_ERROR), 3u); // what is left
     s.SetStreamType(kOVFileStreamNoFile);
-    EXPECT_EQ(Contents(file), "01DC");
+    EXPECT_EQ(ReadFileBytes(file), "01DC");
 }
 
 TEST_F(BinaryFileStream, AddressesOffsetsPastFourGigabytes) {
@@ -214,15 +201,15 @@ TEST_F(BinaryFileStream, RefusesASecondOpenThatTheFirstDoesNotShare) {
     };
     for (Case const& c : cases) {
         SCOPED_TRACE(std::to_string(c.first) + " then " + std::to_string(c.second));
-        Put(file, "held");
+        WriteFileBytes(file, "held");
         OVBinaryFileStream first(file.c_str(), c.first);
-        std::string const held = Contents(file);
+        std::string const held = ReadFileBytes(file);
         if (c.shared)
             OVBinaryFileStream second(file.c_str(), c.second);
         else
             EXPECT_RAISES_IN(OVBinaryFileStream(file.c_str(), c.second), TE_SHARING_VIOLATION,
                              "OVBinaryFileStream::OpenWithNoRetry");
-        EXPECT_EQ(Contents(file), held); // a refused creation empties nothing
+        EXPECT_EQ(ReadFileBytes(file), held); // a refused creation empties nothing
     }
 }
 
@@ -277,7 +264,7 @@ TEST_F(BinaryFileStream, RaisesFailedSystemCallsAndLeavesTheStreamUsable) {
     };
     for (Case const& c : cases) {
         SCOPED_TRACE(c.function);
-        Put(file, "abcd");
+        WriteFileBytes(file, "abcd");
         fs::remove(Path("moved.bin"));
         OVBinaryFileStream s(file.c_str(), kOVFileStreamOpenForReadWrite);
         s.SetOffset(4);
@@ -285,12 +272,13 @@ TEST_F(BinaryFileStream, RaisesFailedSystemCallsAndLeavesTheStreamUsable) {
             ScopedFault const fault(c.kind, 1, native::kDiskFull);
             EXPECT_RAISES_IN(c.op(s), TE_DISK_FULL, c.function);
         }
-        EXPECT_EQ(Contents(file), "abcd");
+        EXPECT_EQ(ReadFileBytes(file), "abcd");
         EXPECT_EQ(s.GetSize(), c.size);
         s.SetOffset(4);
         c.op(s); // works now; bytes kept buffered are written once
         s.Flush();
-        EXPECT_EQ(Contents(fs::exists(Path("moved.bin")) ? Path("moved.bin") : file), c.afterRetry);
+        EXPECT_EQ(ReadFileBytes(fs::exists(Path("moved.bin")) ? Path("moved.bin") : file),
+                  c.afterRetry);
     }
     ScopedFault const open(FaultKind::Open, 1, native::kAccessDenied);
     EXPECT_RAISES_IN(OVBinaryFileStream(file.c_str(), kOVFileStreamCreateForWrite),
@@ -307,7 +295,7 @@ TEST_F(BinaryFileStream, RaisesFailedSystemCallsAndLeavesTheStreamUsable) {
 
 TEST_F(BinaryFileStream, MovesTheOpenFileAndReplacesOnlyWhenForced) {
     std::string const target = Path("target.bin"), other = Path("other.bin");
-    Put(other, "other");
+    WriteFileBytes(other, "other");
     OVBinaryFileStream s(file.c_str(), kOVFileStreamCreateForReadWrite);
     s.WriteBytes("abc", 3);
     s.Move(DynamicString(target.c_str()));
@@ -317,14 +305,14 @@ TEST_F(BinaryFileStream, MovesTheOpenFileAndReplacesOnlyWhenForced) {
     s.WriteBytes("d", 1);
     EXPECT_RAISES_IN(s.Move(DynamicString(other.c_str())), TE_FILE_ALREADY_EXISTS,
                      "OVBinaryFileStream::Move");
-    EXPECT_EQ(Contents(other), "other");
+    EXPECT_EQ(ReadFileBytes(other), "other");
     EXPECT_EQ(s.GetFilePath(), target.c_str());
     s.ForceMove(DynamicString(other.c_str()));
     s.WriteBytes("e", 1);
     EXPECT_EQ(ReadAll(s), "abcde");
     s.SetStreamType(kOVFileStreamNoFile);
     EXPECT_FALSE(fs::exists(target));
-    EXPECT_EQ(Contents(other), "abcde");
+    EXPECT_EQ(ReadFileBytes(other), "abcde");
 }
 
 TEST_F(BinaryFileStream, CopiesFromMemoryAndFileStreamsOnly) {

@@ -6,6 +6,8 @@
 #pragma once
 
 #include <filesystem>
+#include <fstream>
+#include <iterator>
 #include <random>
 #include <string>
 #include <system_error>
@@ -35,5 +37,16 @@ public:
 private:
     std::filesystem::path m_root;
 };
+
+/// The bytes of the file at `path`; empty when it cannot be read.
+inline std::string ReadFileBytes(std::filesystem::path const& path) {
+    std::ifstream in(path, std::ios::binary);
+    return {std::istreambuf_iterator<char>(in), {}};
+}
+
+/// Makes `bytes` the whole contents of the file at `path`.
+inline void WriteFileBytes(std::filesystem::path const& path, std::string const& bytes) {
+    std::ofstream(path, std::ios::binary) << bytes;
+}
 
 } // namespace tekit::testing

@@ -16,21 +16,12 @@ using namespace tekit::tool;
 
 namespace {
 
-int TEKIT_STDCALL ReadLine(void* data, char* buffer, int bufferSize, int* endOfInput,
-                           int* lineNumber) {
-    auto* reader = static_cast<LineFile>(data);
-    int length = 0;
-    int const status = LineFile_ReadNonEmpty(reader, buffer, bufferSize, &length, endOfInput);
-    *lineNumber = LineFile_NumLinesRead(reader);
-    return status < 0 ? status : length;
-}
-
 /// The object the library's reader makes of `text`, listed one section or item per line.
 std::string ReadByLibrary(std::string const& text) {
     IniHandle ini = Ini_New(0, nullptr);
     TextSource source{text};
     LineFile reader = NewTextReader(source);
-    EXPECT_EQ(Ini_ReadGeneric(ini, ReadLine, reader), 0);
+    EXPECT_EQ(Ini_ReadGeneric(ini, ReadTextLine, reader), 0);
     LineFile_Dispose(reader);
     std::ostringstream out;
     for (int s = 1; s <= Ini_NumberOfSections(ini); ++s) {

@@ -381,15 +381,6 @@ std::string ReadAll(std::string const& file) {
     return text;
 }
 
-int TEKIT_STDCALL ReadTextLine(void* data, char* buffer, int bufferSize, int* endOfInput,
-                               int* lineNumber) {
-    auto* reader = static_cast<LineFile>(data);
-    int length = 0;
-    int const status = LineFile_ReadNonEmpty(reader, buffer, bufferSize, &length, endOfInput);
-    *lineNumber = LineFile_NumLinesRead(reader);
-    return status < 0 ? status : length;
-}
-
 /// A library exception about reading a file (its description names the file) as the tool's
 /// error.
 ToolError FileError(TEException const& e) {

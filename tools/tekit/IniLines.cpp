@@ -136,6 +136,15 @@ LineFile NewTextReader(TextSource& source) {
     return LineFile_New(ReadChunk, &source);
 }
 
+int TEKIT_STDCALL ReadTextLine(void* data, char* buffer, int bufferSize, int* endOfInput,
+                               int* lineNumber) {
+    auto* reader = static_cast<LineFile>(data);
+    int length = 0;
+    int const status = LineFile_ReadNonEmpty(reader, buffer, bufferSize, &length, endOfInput);
+    *lineNumber = LineFile_NumLinesRead(reader);
+    return status < 0 ? status : length;
+}
+
 std::vector<IniLine> ReadIniLines(std::string const& text) {
     std::vector<IniLine> lines;
     TextSource source{text};

@@ -27,6 +27,10 @@ struct TextSource {
 };
 /// A line reader over `source` (LineFile_Dispose frees it); null when memory is exhausted.
 LineFile NewTextReader(TextSource& source);
+/// The line callback of Ini_ReadGeneric over a reader from NewTextReader (`data`): empty lines
+/// skipped, each line's number reported as the reader counts it.
+int TEKIT_STDCALL ReadTextLine(void* data, char* buffer, int bufferSize, int* endOfInput,
+                               int* lineNumber);
 
 /// The longest line the INI reader takes; the rest of a longer line is dropped.
 constexpr int kIniLineLimit = 640;

@@ -64,58 +64,68 @@ void ReadThunks(ImageReader& reader, std::uint32_t list, ImportedModule& module)
     }
 }
 
-void ReadOrdinaryImports(ImageReader& reader, ImportTable& table) {
-    std::uint32_t const directory = reader.Image().directoryRva[executable::kImportDirectory];
+/// Reads the `Size`-byte descriptors of data directory `index` in turn until `take` returns
+/// false (the list's end); `what` names the directory in errors.
+template <std::uint32_t Size, class Take>
+void ForEachDescriptor(ImageReader& reader, executable::DataDirectory index, char const* what,
+                       Take&& take) {
+    std::uint32_t const directory = reader.Image().directoryRva[index];
     if (directory == 0)
         return;
     for (std::uint64_t i = 0;; ++i) {
-        unsigned char d[kImportDescriptorSize];
-        reader.Read(reader.Add(directory, i * kImportDescriptorSize, "import directory"), d,
-                    sizeof d, "import directory");
-        std::uint32_t const lookup = Le32(d), nameRva = Le32(d + 12), addresses = Le32(d + 16);
-        // The list ends with a descriptor that points to no table.
-        if (lookup == 0 && addresses == 0)
+        unsigned char d[Size];
+        reader.Read(reader.Add(directory, i * Size, what), d, sizeof d, what);
+        if (!take(static_cast<unsigned char const*>(d)))
             return;
-        reader.ChargeEntries(1, "import directory");
-        ImportedModule module;
-        module.name = reader.Name(nameRva, "imported DLL's name");
-        ReadThunks(reader, lookup != 0 ? lookup : addresses, module);
-        table.Add(std::move(module));
     }
+}
+
+void ReadOrdinaryImports(ImageReader& reader, ImportTable& table) {
+    ForEachDescriptor<kImportDescriptorSize>(
+        reader, executable::kImportDirectory, "import directory", [&](unsigned char const* d) {
+            std::uint32_t const lookup = Le32(d), nameRva = Le32(d + 12), addresses = Le32(d + 16);
+            // The list ends with a descriptor that points to no table.
+            if (lookup == 0 && addresses == 0)
+                return false;
+            reader.ChargeEntries(1, "import directory");
+            ImportedModule module;
+            module.name = reader.Name(nameRva, "imported DLL's name");
+            ReadThunks(reader, lookup != 0 ? lookup : addresses, module);
+            table.Add(std::move(module));
+            return true;
+        });
 }
 
 void ReadDelayImports(ImageReader& reader, ImportTable& table) {
     PEImage const& image = reader.Image();
-    std::uint32_t const directory = image.directoryRva[executable::kDelayImportDirectory];
-    if (directory == 0)
-        return;
-    for (std::uint64_t i = 0;; ++i) {
-        unsigned char d[kDelayDescriptorSize];
-        reader.Read(reader.Add(directory, i * kDelayDescriptorSize, "delay-load directory"), d,
-                    sizeof d, "delay-load directory");
-        if (AllZero(d, sizeof d))
-            return;
-        std::uint32_t const attributes = Le32(d);
-        std::uint32_t nameRva = Le32(d + 4), names = Le32(d + 16);
-        if (nameRva == 0)
-            return;
-        // Descriptors of the oldest linkers (attribute bit 0 clear) hold addresses, not RVAs.
-        if ((attributes & 1) == 0) {
-            std::uint64_t const base = image.imageBase;
-            if (nameRva < base || nameRva - base > 0xffffffffu || (names && names < base))
-                reader.Malformed(Detail("EXE_RVA_WRAPS_1", "delay-load directory"));
-            nameRva = static_cast<std::uint32_t>(nameRva - base);
-            if (names)
-                names = static_cast<std::uint32_t>(names - base);
-        }
-        reader.ChargeEntries(1, "delay-load directory");
-        ImportedModule module;
-        module.delayLoaded = true;
-        module.name = reader.Name(nameRva, "delay-loaded DLL's name");
-        if (names != 0)
-            ReadThunks(reader, names, module);
-        table.Add(std::move(module));
-    }
+    ForEachDescriptor<kDelayDescriptorSize>(
+        reader, executable::kDelayImportDirectory, "delay-load directory",
+        [&](unsigned char const* d) {
+            if (AllZero(d, kDelayDescriptorSize))
+                return false;
+            std::uint32_t const attributes = Le32(d);
+            std::uint32_t nameRva = Le32(d + 4), names = Le32(d + 16);
+            if (nameRva == 0)
+                return false;
+            // Descriptors of the oldest linkers (attribute bit 0 clear) hold addresses, not
+            // RVAs.
+            if ((attributes & 1) == 0) {
+                std::uint64_t const base = image.imageBase;
+                if (nameRva < base || nameRva - base > 0xffffffffu || (names && names < base))
+                    reader.Malformed(Detail("EXE_RVA_WRAPS_1", "delay-load directory"));
+                nameRva = static_cast<std::uint32_t>(nameRva - base);
+                if (names)
+                    names = static_cast<std::uint32_t>(names - base);
+            }
+            reader.ChargeEntries(1, "delay-load directory");
+            ImportedModule module;
+            module.delayLoaded = true;
+            module.name = reader.Name(nameRva, "delay-loaded DLL's name");
+            if (names != 0)
+                ReadThunks(reader, names, module);
+            table.Add(std::move(module));
+            return true;
+        });
 }
 
 } // namespace
