@@ -45,7 +45,9 @@ DynamicString Message(char const* key, std::initializer_list<char const*> argume
     std::string const text = message.GetBufferReadPtr();
     std::vector<std::pair<std::size_t, long>> order; // (where it stands, its number)
     for (long number = 1; number <= static_cast<long>(arguments.size()); ++number) {
-        std::size_t const at = text.find("%" + std::to_string(number));
+        std::string placeholder = "%";
+        placeholder += std::to_string(number);
+        std::size_t const at = text.find(placeholder);
         // One the text lacks is filled last: Format then appends it, visibly.
         order.emplace_back(at == std::string::npos ? 0 : at + 1, number);
     }

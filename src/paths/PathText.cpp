@@ -4,6 +4,8 @@
 #include "paths/PathRules.h"
 #include "tekit/errors/Raise.h"
 
+#include <string_view>
+
 namespace tekit {
 
 using namespace detail;
@@ -90,7 +92,8 @@ void PathBase::ConvertForLongPathCalls(String const& path, String& converted) {
     DynamicString result;
     if (UsesUNC(path)) {
         result.Assign(kLongUncPrefix);
-        result += path.GetBufferReadPtr() + 2; // the two backslashes are single bytes
+        // The two backslashes are single bytes; a suffix of the text ends with its NUL.
+        result += std::string_view(path.GetBufferReadPtr()).substr(2).data();
     } else {
         result.Assign(kLongPrefix);
         result += path;
